@@ -1,0 +1,139 @@
+// Scoped access to Java arrays.
+//
+// copiedjniarray: the JNI's element copy (Get<Type>ArrayElements); read-only
+// instances release with JNI_ABORT, read-write ones copy back.
+// pinnedjniarray: critical, pinned access for large per-call arrays; no JNI call
+// may be made while one is alive.
+//
+// The JNI environment is held per wrapper object, so arrays of one type can be
+// used by several threads at once.
+#pragma once
+
+#include <jni.h>
+
+#include <atomic>
+
+#include "jni/Exception.h"
+
+template <class T, class A>
+struct jniarray_traits;
+
+#define PAVOQEN_ARRAY_TRAITS(T, A, Name)                                                  \
+    template <>                                                                           \
+    struct jniarray_traits<T, A> {                                                        \
+        static T* get(JNIEnv* env, A a, jboolean* c) {                                    \
+            return reinterpret_cast<T*>(env->Get##Name##ArrayElements(a, c));             \
+        }                                                                                 \
+        static void release(JNIEnv* env, A a, T* e, jint mode) {                          \
+            env->Release##Name##ArrayElements(a, reinterpret_cast<decltype(env->Get##Name##ArrayElements(a, nullptr))>(e), mode); \
+        }                                                                                 \
+    };
+PAVOQEN_ARRAY_TRAITS(int, jintArray, Int)
+PAVOQEN_ARRAY_TRAITS(short, jshortArray, Short)
+PAVOQEN_ARRAY_TRAITS(signed char, jbyteArray, Byte)
+PAVOQEN_ARRAY_TRAITS(unsigned char, jbooleanArray, Boolean)
+PAVOQEN_ARRAY_TRAITS(float, jfloatArray, Float)
+#undef PAVOQEN_ARRAY_TRAITS
+
+// Shared checks: a null array where elements are needed throws
+// NullPointerException; one shorter than needed throws
+// ArrayIndexOutOfBoundsException(first missing index, length).
+template <class Derived>
+struct jniarray_checks {
+    void need(long long n) const {
+        const Derived& d = static_cast<const Derived&>(*this);
+        if (n <= 0) return;
+        if (!d.array) throw new NullPointerException();
+        if (n > d.length) throw new ArrayIndexOutOfBoundsException(int(n > 0x7fffffff ? 0x7fffffff : n - 1), d.length);
+    }
+    void need_range(long long offset, long long n) const {
+        const Derived& d = static_cast<const Derived&>(*this);
+        if (n <= 0) return;
+        if (!d.array) throw new NullPointerException();
+        check_range(offset, n, d.length);
+    }
+};
+
+std::atomic<int>& pin_count_ref();
+
+template <class T, class A, bool ReadOnly>
+class copiedjniarray : public jniarray_checks<copiedjniarray<T, A, ReadOnly>> {
+public:
+    copiedjniarray(JNIEnv* e, A a) : env(e), iscopy(JNI_FALSE), array(a), elements(nullptr), length(0) {
+        if (array) {
+            length = env->GetArrayLength(array);
+            getElements();
+            if (!elements) {
+                // The JNI has raised OutOfMemoryError; do not touch the array.
+                array = nullptr;
+                length = 0;
+                throw new OutOfMemory("array elements");
+            }
+        }
+    }
+    ~copiedjniarray() {
+        if (array) releaseElements();
+    }
+    void getElements() { elements = jniarray_traits<T, A>::get(env, array, &iscopy); }
+    void releaseElements() {
+        jniarray_traits<T, A>::release(env, array, elements, ReadOnly ? JNI_ABORT : 0);
+        array = nullptr;
+        elements = nullptr;
+    }
+    T& operator[](long long i) { return elements[i]; }
+    const T& operator[](long long i) const { return elements[i]; }
+    T* data() const { return elements; }
+    bool isnull() const { return array == nullptr; }
+
+    JNIEnv* env;
+    jboolean iscopy;
+    A array;
+    T* elements;
+    jsize length;
+
+    copiedjniarray(const copiedjniarray&) = delete;
+    copiedjniarray& operator=(const copiedjniarray&) = delete;
+};
+
+typedef copiedjniarray<int, jintArray, true> copied_jintArrayRO;
+
+template <class T, class A, bool ReadOnly>
+class pinnedjniarray : public jniarray_checks<pinnedjniarray<T, A, ReadOnly>> {
+public:
+    pinnedjniarray(JNIEnv* e, A a) : env(e), iscopy(JNI_FALSE), array(a), elements(nullptr), length(0) {
+        if (array) {
+            length = env->GetArrayLength(array);
+            elements = static_cast<T*>(env->GetPrimitiveArrayCritical(array, &iscopy));
+            if (!elements) {
+                array = nullptr;
+                length = 0;
+                throw new OutOfMemory("array elements");
+            }
+            ++pin_count_ref();
+        }
+    }
+    ~pinnedjniarray() {
+        if (array) {
+            env->ReleasePrimitiveArrayCritical(array, elements, ReadOnly ? JNI_ABORT : 0);
+            --pin_count_ref();
+            array = nullptr;
+            elements = nullptr;
+        }
+    }
+    T& operator[](long long i) { return elements[i]; }
+    const T& operator[](long long i) const { return elements[i]; }
+    T* data() const { return elements; }
+    bool isnull() const { return array == nullptr; }
+
+    JNIEnv* env;
+    jboolean iscopy;
+    A array;
+    T* elements;
+    jsize length;
+
+    pinnedjniarray(const pinnedjniarray&) = delete;
+    pinnedjniarray& operator=(const pinnedjniarray&) = delete;
+};
+
+// Current number of pinned arrays in the process.
+int pin_count();

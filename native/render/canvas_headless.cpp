@@ -1,0 +1,1 @@
+// Headless canvas for builds without a window system.

@@ -1,0 +1,1 @@
+// Window glue (JAWT + Xlib/MIT-SHM) arrives with the canvas work.

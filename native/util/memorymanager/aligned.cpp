@@ -1,0 +1,27 @@
+#include "util/memorymanager/aligned.h"
+
+#include <cstdlib>
+#include <cstring>
+
+#include "jni/Exception.h"
+
+void* _aligned_malloc(unsigned int size, unsigned int alignment) {
+    if (alignment < 8) alignment = 8;
+    void* p = nullptr;
+    int err = posix_memalign(&p, alignment, size ? size : 1);
+    if (err != 0) throw new RuntimeException(strerror(err));
+    return p;
+}
+
+void* _aligned_realloc(void* p, unsigned int oldsize, unsigned int size, unsigned int alignment) {
+    if (alignment < 8) alignment = 8;
+    void* q = nullptr;
+    if (posix_memalign(&q, alignment, size ? size : 1) != 0) return nullptr;
+    if (p) {
+        std::memcpy(q, p, oldsize < size ? oldsize : size);
+        std::free(p);
+    }
+    return q;
+}
+
+void _aligned_free(void* p) { std::free(p); }
