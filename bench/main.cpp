@@ -1,0 +1,55 @@
+// Runs every registered benchmark, then prints the ratio lines.
+#include <benchmark/benchmark.h>
+
+#include <cstdio>
+#include <map>
+
+#include "ratio.h"
+
+std::vector<bench_ratio>& bench_ratios() {
+    static std::vector<bench_ratio> r;
+    return r;
+}
+
+namespace {
+struct recorded {
+    double time = 0;  // real time per iteration, ns
+    std::map<std::string, double> counters;
+};
+
+class recording_reporter : public benchmark::ConsoleReporter {
+public:
+    std::map<std::string, recorded> runs;
+    void ReportRuns(const std::vector<Run>& reports) override {
+        for (const Run& r : reports) {
+            if (r.run_type != Run::RT_Iteration || r.error_occurred) continue;
+            recorded& rec = runs[r.benchmark_name()];
+            rec.time = r.GetAdjustedRealTime();
+            for (auto& c : r.counters) rec.counters[c.first] = c.second.value;
+        }
+        ConsoleReporter::ReportRuns(reports);
+    }
+};
+}  // namespace
+
+int main(int argc, char** argv) {
+    benchmark::Initialize(&argc, argv);
+    recording_reporter reporter;
+    benchmark::RunSpecifiedBenchmarks(&reporter);
+    std::fflush(stdout);
+    std::printf("\n");
+    for (const bench_ratio& r : bench_ratios()) {
+        auto a = reporter.runs.find(r.ours), b = reporter.runs.find(r.peer);
+        if (a == reporter.runs.end() || b == reporter.runs.end()) continue;
+        double value;
+        if (r.counter.empty()) {
+            value = a->second.time > 0 ? b->second.time / a->second.time : 0;
+        } else {
+            double x = a->second.counters[r.counter], y = b->second.counters[r.counter];
+            value = y > 0 ? x / y : 0;
+        }
+        std::printf("ratio %s %.2f\n", r.name.c_str(), value);
+    }
+    benchmark::Shutdown();
+    return 0;
+}
