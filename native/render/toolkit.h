@@ -77,7 +77,9 @@ public:
               int maskx, int masky);
     void line_thick(threadresource& tr, int x1, int y1, int x2, int y2, unsigned int colour, int thickness,
                     unsigned int mode);
-    // out must hold w*h ints; the rectangle must lie inside the target.
+    // out must hold w*h ints (element j*w + i is pixel (x+i, y+j)). Both copy
+    // only the part of the rectangle inside the target; getarea throws
+    // Exception "No colour buffer" without a colour buffer.
     void getarea(int x, int y, int w, int h, int* out);
     void setarea(int x, int y, int w, int h, const int* in, int offset, int stride);
 
