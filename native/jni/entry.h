@@ -10,9 +10,15 @@
 // A native Exception* becomes its Java exception; anything else becomes a
 // RuntimeException "System exception occured". Failures return the zero value
 // of the result type.
+//
+// The renderer runs with flush-to-zero and denormals-are-zero set. Those bits
+// are set for the duration of each entry only and the caller's SSE control
+// word is restored on the way out: the JVM's own float code on the same thread
+// needs IEEE gradual underflow.
 #pragma once
 
 #include <jni.h>
+#include <xmmintrin.h>
 
 #include <cstdint>
 #include <type_traits>
@@ -21,11 +27,25 @@
 
 namespace entry_detail {
 void raise_system_exception(JNIEnv* env);
-}
+
+constexpr unsigned int kFlushDenormals = 0x8040;  // FTZ | DAZ
+
+class fp_mode_scope {
+public:
+    fp_mode_scope() : m_Saved(_mm_getcsr()) { _mm_setcsr(m_Saved | kFlushDenormals); }
+    ~fp_mode_scope() { _mm_setcsr(m_Saved); }
+    fp_mode_scope(const fp_mode_scope&) = delete;
+    fp_mode_scope& operator=(const fp_mode_scope&) = delete;
+
+private:
+    unsigned int m_Saved;
+};
+}  // namespace entry_detail
 
 template <class F>
 auto guarded(JNIEnv* env, F&& body) -> decltype(body()) {
     using R = decltype(body());
+    entry_detail::fp_mode_scope fp_mode;
     try {
         return body();
     } catch (Exception* e) {
