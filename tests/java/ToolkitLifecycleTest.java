@@ -1,0 +1,76 @@
+import static org.junit.jupiter.api.Assertions.*;
+
+import org.junit.jupiter.api.BeforeAll;
+import org.junit.jupiter.api.Test;
+
+/** Creating and destroying the toolkit through its peer. */
+class ToolkitLifecycleTest {
+    @BeforeAll
+    static void load() {
+        TestSupport.load();
+    }
+
+    @Test
+    void createBindsAndDestroyClears() {
+        ja tk = new ja();
+        assertEquals(0L, tk.nativeid);
+        tk.q(null, 0);
+        try {
+            assertNotEquals(0L, tk.nativeid);
+            assertEquals(0L, tk.nativeid & 15, "the toolkit is 16-byte aligned");
+        } finally {
+            tk.ma();
+        }
+        assertEquals(0L, tk.nativeid);
+    }
+
+    @Test
+    void createWithTextureSourceAndRecreate() {
+        ja.TextureSource none = (t, id) -> false;
+        for (int round = 0; round < 3; ++round) {
+            ja tk = Pavoqen.createToolkit(none, 4096);
+            assertNotEquals(0L, tk.nativeid);
+            assertSame(none, tk.getTextureSource());
+            tk.ma();
+            assertEquals(0L, tk.nativeid);
+        }
+    }
+
+    @Test
+    void callbacksHaveReplaceableDefaults() {
+        ja tk = new ja();
+        assertFalse(tk.SA((short) 5), "no texture source: requests fail");
+        int[] asked = {-1};
+        tk.setTextureSource((t, id) -> {
+            asked[0] = id;
+            return true;
+        });
+        assertTrue(tk.SA((short) -2));
+        assertEquals(65534, asked[0], "ids arrive unsigned");
+
+        assertTrue(tk.WA() instanceof aa);
+        assertEquals(0L, ((aa) tk.WA()).nativeid);
+        aa mine = new aa();
+        tk.setShadowFactory(() -> mine);
+        assertSame(mine, tk.WA());
+
+        int[] collected = {0};
+        tk.setGarbageCollector(() -> collected[0]++);
+        tk.h();
+        assertEquals(1, collected[0]);
+    }
+
+    @Test
+    void destroyingAnUnboundPeerIsHarmless() {
+        ja tk = new ja();
+        tk.q(null, 0);
+        try {
+            // a peer that was never bound holds 0: nothing to destroy
+            ja other = new ja();
+            other.ma();
+            assertEquals(0L, other.nativeid);
+        } finally {
+            tk.ma();
+        }
+    }
+}
