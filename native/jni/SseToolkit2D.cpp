@@ -60,4 +60,14 @@ JNIEXPORT void JNICALL Java_ja_R(JNIEnv* env, jobject, jint x1, jint y1, jint x2
     });
 }
 
+// bit 0: clear the colour buffer's clip rectangle to colour; bit 1: clear
+// the depth buffer's clip rectangle to the far value.
+JNIEXPORT void JNICALL Java_ja_ba(JNIEnv* env, jobject, jint flags, jint colour) {
+    guarded(env, [&] {
+        toolkit& t = tk();
+        if (flags & 1) t.cls(unsigned(colour));
+        if (flags & 2) t.zbuffer_clear(0, 0, t.m_Width, t.m_Height, 3.4e38f);
+    });
+}
+
 }  // extern "C"
