@@ -26,7 +26,12 @@ public:
     clippingmask(memorymanager* pool, int width, int height, const int* starts, int nstarts, const int* lengths,
                  int nlengths);
 
-    int rows() const { return m_Starts.count(); }
+    // Rows with both a start and a length (both arrays lose their elements
+    // when their pool is released).
+    int rows() const {
+        const int s = m_Starts.count(), l = m_Lengths.count();
+        return s < l ? s : l;
+    }
     const int* starts() const { return m_Starts.data(); }
     const int* lengths() const { return m_Lengths.data(); }
 
