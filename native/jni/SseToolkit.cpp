@@ -126,13 +126,14 @@ JNIEXPORT void JNICALL Java_ja_IA(JNIEnv* env, jobject, jfloat ambient) {
 JNIEXPORT void JNICALL Java_ja_Q(JNIEnv* env, jobject, jint count, jintArray lights, jfloatArray intensities) {
     guarded(env, [&] {
         toolkit& t = tk();
-        pinnedjniarray<int, jintArray, true> l(env, lights);
-        pinnedjniarray<float, jfloatArray, true> f(env, intensities);
+        pinnedjniarray<int, jintArray, true> l(env, lights, defer_pin);
+        pinnedjniarray<float, jfloatArray, true> f(env, intensities, defer_pin);
         int n = count > 4 ? 4 : count;
         if (n > 0) {
             l.need(5LL * n);
             f.need(n);
         }
+        pin_all(l, f);
         t.set_pointlights(count, l.data(), f.data());
     });
 }

@@ -64,9 +64,11 @@ public:
             length = env->GetArrayLength(array);
             getElements();
             if (!elements) {
-                // The JNI has raised OutOfMemoryError; do not touch the array.
+                // The JNI has raised OutOfMemoryError; replace it by ours so that
+                // no JNI call is made with an exception pending.
                 array = nullptr;
                 length = 0;
+                if (env->ExceptionCheck()) env->ExceptionClear();
                 throw new OutOfMemory("array elements");
             }
         }
@@ -97,23 +99,41 @@ public:
 
 typedef copiedjniarray<int, jintArray, true> copied_jintArrayRO;
 
+// Tag for a pinned array that is pinned later, by pin() or pin_all(). When one
+// entry pins several arrays, every length must be read (a JNI call) before the
+// first array is pinned:
+//
+//   pinnedjniarray<int, jintArray, true> a(env, ja, defer_pin);
+//   pinnedjniarray<float, jfloatArray, true> b(env, jb, defer_pin);
+//   a.need(n); b.need(m);      // checks before anything is pinned
+//   pin_all(a, b);
+//
+// Copied arrays and result arrays are likewise created before the first pin.
+struct defer_pin_t {};
+constexpr defer_pin_t defer_pin{};
+
 template <class T, class A, bool ReadOnly>
 class pinnedjniarray : public jniarray_checks<pinnedjniarray<T, A, ReadOnly>> {
 public:
-    pinnedjniarray(JNIEnv* e, A a) : env(e), iscopy(JNI_FALSE), array(a), elements(nullptr), length(0) {
-        if (array) {
-            length = env->GetArrayLength(array);
-            elements = static_cast<T*>(env->GetPrimitiveArrayCritical(array, &iscopy));
-            if (!elements) {
-                array = nullptr;
-                length = 0;
-                throw new OutOfMemory("array elements");
-            }
-            ++pin_count_ref();
+    pinnedjniarray(JNIEnv* e, A a) : pinnedjniarray(e, a, defer_pin) { pin(); }
+    // Reads the length only; elements stay null until pin().
+    pinnedjniarray(JNIEnv* e, A a, defer_pin_t) : env(e), iscopy(JNI_FALSE), array(a), elements(nullptr), length(0) {
+        if (array) length = env->GetArrayLength(array);
+    }
+    // Pins the array (nothing for a null array or one already pinned).
+    void pin() {
+        if (!array || elements) return;
+        elements = static_cast<T*>(env->GetPrimitiveArrayCritical(array, &iscopy));
+        if (!elements) {
+            array = nullptr;
+            length = 0;
+            if (env->ExceptionCheck()) env->ExceptionClear();
+            throw new OutOfMemory("array elements");
         }
+        ++pin_count_ref();
     }
     ~pinnedjniarray() {
-        if (array) {
+        if (array && elements) {
             env->ReleasePrimitiveArrayCritical(array, elements, ReadOnly ? JNI_ABORT : 0);
             --pin_count_ref();
             array = nullptr;
@@ -134,6 +154,12 @@ public:
     pinnedjniarray(const pinnedjniarray&) = delete;
     pinnedjniarray& operator=(const pinnedjniarray&) = delete;
 };
+
+// Pins deferred arrays in argument order.
+template <class... P>
+void pin_all(P&... arrays) {
+    (arrays.pin(), ...);
+}
 
 // Current number of pinned arrays in the process.
 int pin_count();

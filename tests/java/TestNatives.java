@@ -54,7 +54,9 @@ final class TestNatives {
     /** Pins (or copies) {@code a} read-write, sets a[0] = 99, then throws {@code kind}. */
     static native void pinThenRaise(int[] a, int kind);
     static native void copyThenRaise(int[] a, int kind);
-    /** pin_count() seen inside the last pinThenRaise. */
+    /** Pins both arrays together after checking n elements in each; adds 1 to every element. */
+    static native void pinTwo(int[] a, float[] b, int n);
+    /** pin_count() seen inside the last pinThenRaise or pinTwo (-1: pinTwo pinned nothing). */
     static native int pinsInside();
     static native int pinCount();
     /** {length, elements == null ? 1 : 0, change of pin_count} for a pinned null array. */
@@ -63,8 +65,6 @@ final class TestNatives {
     static native void need(int[] a, int n);
     static native void needRange(int[] a, int offset, int n);
 
-    /** Sets the target size of the toolkit with native id {@code toolkit}. */
-    static native void setTargetSize(long toolkit, int width, int height);
     /** Camera, projection and view-projection: 48 floats, row by row. */
     static native float[] matrices(long toolkit);
     /** Point light count, then x, y, z, scale of each of the four lights. */

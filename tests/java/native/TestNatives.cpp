@@ -286,6 +286,23 @@ JNIEXPORT void JNICALL Java_TestNatives_copyThenRaise(JNIEnv* env, jclass, jintA
     });
 }
 
+// Two arrays pinned together: both lengths are read and checked (n elements
+// each) before either is pinned; then every element is incremented.
+JNIEXPORT void JNICALL Java_TestNatives_pinTwo(JNIEnv* env, jclass, jintArray a, jfloatArray b, jint n) {
+    g_pins_inside = -1;
+    guarded(env, [&] {
+        pinnedjniarray<int, jintArray, false> x(env, a, defer_pin);
+        pinnedjniarray<float, jfloatArray, false> y(env, b, defer_pin);
+        x.need(n);
+        y.need(n);
+        pin_all(x, y);
+        pin_all(x, y);  // pinning again does nothing
+        g_pins_inside = pin_count();
+        bump(x);
+        bump(y);
+    });
+}
+
 JNIEXPORT jint JNICALL Java_TestNatives_pinsInside(JNIEnv*, jclass) { return g_pins_inside; }
 JNIEXPORT jint JNICALL Java_TestNatives_pinCount(JNIEnv*, jclass) { return pin_count(); }
 
@@ -324,17 +341,9 @@ JNIEXPORT void JNICALL Java_TestNatives_needRange(JNIEnv* env, jclass, jintArray
 
 // ---- toolkit state behind a product toolkit's native id ----------------------------------
 // Both libraries are built from the same toolkit declaration, so its fields
-// can be read (and the target size set) from here.
+// can be read from here.
 
 static toolkit& toolkit_at(jlong id) { return *from_id_checked<toolkit>(id); }
-
-JNIEXPORT void JNICALL Java_TestNatives_setTargetSize(JNIEnv* env, jclass, jlong id, jint w, jint h) {
-    guarded(env, [&] {
-        toolkit& t = toolkit_at(id);
-        t.m_Width = w;
-        t.m_Height = h;
-    });
-}
 
 // camera, projection, viewprojection: 48 floats, row by row.
 JNIEXPORT jfloatArray JNICALL Java_TestNatives_matrices(JNIEnv* env, jclass, jlong id) {

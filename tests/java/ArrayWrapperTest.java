@@ -1,0 +1,166 @@
+import static org.junit.jupiter.api.Assertions.*;
+
+import org.junit.jupiter.api.BeforeAll;
+import org.junit.jupiter.api.Test;
+
+/**
+ * Copied and pinned Java arrays: read-only ones leave the Java array unchanged
+ * even when native code writes through them, read-write ones carry changes back,
+ * pins are released when an exception passes, and short or null arrays are
+ * refused with a Java exception.
+ *
+ * Under -Xcheck:jni the JVM hands out checked copies for pinned access too, so
+ * a read-only pinned array stays unchanged only because it is released with
+ * JNI_ABORT.
+ */
+class ArrayWrapperTest {
+    @BeforeAll
+    static void load() {
+        TestSupport.loadTestNatives();
+    }
+
+    @Test
+    void copiedArraysOfEveryElementType() {
+        for (boolean ro : new boolean[] {true, false}) {
+            int[] ints = {1, -2, 0x7fffffff};
+            short[] shorts = {1, -2, 0x7fff};
+            byte[] bytes = {1, -2, 0x7f};
+            boolean[] bools = {true, false};
+            float[] floats = {1.5f, -2f};
+            assertEquals(3, TestNatives.copiedInts(ints, ro));
+            assertEquals(3, TestNatives.copiedShorts(shorts, ro));
+            assertEquals(3, TestNatives.copiedBytes(bytes, ro));
+            assertEquals(2, TestNatives.copiedBooleans(bools, ro));
+            assertEquals(2, TestNatives.copiedFloats(floats, ro));
+            if (ro) {
+                assertArrayEquals(new int[] {1, -2, 0x7fffffff}, ints);
+                assertArrayEquals(new short[] {1, -2, 0x7fff}, shorts);
+                assertArrayEquals(new byte[] {1, -2, 0x7f}, bytes);
+                assertArrayEquals(new boolean[] {true, false}, bools);
+                assertArrayEquals(new float[] {1.5f, -2f}, floats);
+            } else {
+                assertArrayEquals(new int[] {2, -1, 0x80000000}, ints);
+                assertArrayEquals(new short[] {2, -1, (short) 0x8000}, shorts);
+                assertArrayEquals(new byte[] {2, -1, (byte) 0x80}, bytes);
+                assertArrayEquals(new boolean[] {false, true}, bools);
+                assertArrayEquals(new float[] {2.5f, -1f}, floats);
+            }
+        }
+    }
+
+    @Test
+    void pinnedArraysOfEveryElementType() {
+        for (boolean ro : new boolean[] {true, false}) {
+            int[] ints = {5, 6, 7, 8};
+            float[] floats = {0.25f};
+            short[] shorts = {-1, 9};
+            boolean[] bools = {false, false, true};
+            assertEquals(4, TestNatives.pinnedInts(ints, ro));
+            assertEquals(1, TestNatives.pinnedFloats(floats, ro));
+            assertEquals(2, TestNatives.pinnedShorts(shorts, ro));
+            assertEquals(3, TestNatives.pinnedBooleans(bools, ro));
+            if (ro) {
+                assertArrayEquals(new int[] {5, 6, 7, 8}, ints);
+                assertArrayEquals(new float[] {0.25f}, floats);
+                assertArrayEquals(new short[] {-1, 9}, shorts);
+                assertArrayEquals(new boolean[] {false, false, true}, bools);
+            } else {
+                assertArrayEquals(new int[] {6, 7, 8, 9}, ints);
+                assertArrayEquals(new float[] {1.25f}, floats);
+                assertArrayEquals(new short[] {0, 10}, shorts);
+                assertArrayEquals(new boolean[] {true, true, false}, bools);
+            }
+            assertEquals(0, TestNatives.pinCount());
+        }
+    }
+
+    @Test
+    void nullAndEmptyArraysAreAccepted() {
+        for (boolean ro : new boolean[] {true, false}) {
+            assertEquals(0, TestNatives.copiedInts(null, ro));
+            assertEquals(0, TestNatives.copiedBooleans(null, ro));
+            assertEquals(0, TestNatives.pinnedInts(null, ro));
+            assertEquals(0, TestNatives.pinnedInts(new int[0], ro));
+            assertEquals(0, TestNatives.copiedFloats(new float[0], ro));
+        }
+        assertArrayEquals(new int[] {0, 1, 0}, TestNatives.pinnedNull(), "length 0, no elements, pin count unchanged");
+    }
+
+    @Test
+    void pinIsReleasedWhenAnExceptionPasses() {
+        int[] a = {1, 2};
+        assertThrows(IllegalStateException.class, () -> TestNatives.pinThenRaise(a, TestNatives.ILLEGAL_STATE));
+        assertEquals(1, TestNatives.pinsInside());
+        assertEquals(0, TestNatives.pinCount());
+        assertArrayEquals(new int[] {99, 2}, a, "a read-write pin copies back on the way out: no rollback");
+
+        a[0] = 1;
+        RuntimeException e = assertThrows(RuntimeException.class,
+                () -> TestNatives.pinThenRaise(a, TestNatives.STD_EXCEPTION));
+        assertEquals("System exception occured", e.getMessage());
+        assertEquals(0, TestNatives.pinCount());
+        assertEquals(99, a[0]);
+
+        // the critical region is left before the Java exception object is built
+        assertThrows(ArrayIndexOutOfBoundsException.class,
+                () -> TestNatives.pinThenRaise(new int[1], TestNatives.INDEX_5_OF_3));
+        assertEquals(0, TestNatives.pinCount());
+
+        assertThrows(NullPointerException.class, () -> TestNatives.pinThenRaise(null, TestNatives.ILLEGAL_STATE));
+        assertEquals(0, TestNatives.pinCount());
+    }
+
+    @Test
+    void severalArraysArePinnedOnlyAfterAllAreChecked() {
+        int[] a = {1, 2, 3};
+        float[] b = {0.5f, 1.5f, 2.5f};
+        TestNatives.pinTwo(a, b, 3);
+        assertEquals(2, TestNatives.pinsInside());
+        assertArrayEquals(new int[] {2, 3, 4}, a);
+        assertArrayEquals(new float[] {1.5f, 2.5f, 3.5f}, b);
+        assertEquals(0, TestNatives.pinCount());
+
+        assertThrows(ArrayIndexOutOfBoundsException.class, () -> TestNatives.pinTwo(a, new float[2], 3));
+        assertEquals(-1, TestNatives.pinsInside(), "refused before pinning");
+        assertThrows(NullPointerException.class, () -> TestNatives.pinTwo(a, null, 1));
+        assertArrayEquals(new int[] {2, 3, 4}, a);
+        assertEquals(0, TestNatives.pinCount());
+        TestNatives.pinTwo(null, null, 0);
+    }
+
+    @Test
+    void copiedArrayIsWrittenBackWhenAnExceptionPasses() {
+        int[] a = {1, 2};
+        assertThrows(IllegalArgumentException.class,
+                () -> TestNatives.copyThenRaise(a, TestNatives.ILLEGAL_ARGUMENT));
+        assertArrayEquals(new int[] {99, 2}, a);
+    }
+
+    static String indexMessage(int index) {
+        return new ArrayIndexOutOfBoundsException(index).getMessage();
+    }
+
+    @Test
+    void shortAndNullArraysAreRefused() {
+        int[] three = {1, 2, 3};
+        TestNatives.need(three, 3);
+        TestNatives.need(three, 0);
+        TestNatives.need(null, 0);
+        assertEquals(indexMessage(3),
+                assertThrows(ArrayIndexOutOfBoundsException.class, () -> TestNatives.need(three, 4)).getMessage());
+        assertThrows(ArrayIndexOutOfBoundsException.class, () -> TestNatives.need(three, Integer.MAX_VALUE));
+        assertEquals("", assertThrows(NullPointerException.class, () -> TestNatives.need(null, 1)).getMessage());
+
+        TestNatives.needRange(three, 1, 2);
+        TestNatives.needRange(three, 3, 0);
+        assertEquals(indexMessage(3), assertThrows(ArrayIndexOutOfBoundsException.class,
+                () -> TestNatives.needRange(three, 2, 2)).getMessage());
+        assertEquals(indexMessage(-1), assertThrows(ArrayIndexOutOfBoundsException.class,
+                () -> TestNatives.needRange(three, -1, 1)).getMessage());
+        assertThrows(ArrayIndexOutOfBoundsException.class,
+                () -> TestNatives.needRange(three, Integer.MAX_VALUE, 2));
+        assertThrows(NullPointerException.class, () -> TestNatives.needRange(null, 0, 1));
+        assertEquals(0, TestNatives.pinCount());
+        assertArrayEquals(new int[] {1, 2, 3}, three);
+    }
+}
