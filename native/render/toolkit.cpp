@@ -94,11 +94,16 @@ void toolkit::set_active_canvas(canvas* c) {
     m_OffscreenSprite = nullptr;
     m_OffscreenDepth = nullptr;
     if (!c) {
+        // No target: a zero-sized one with an empty clip, so that drawing
+        // before the next activation writes nothing through the null buffers.
         Rasterizer_n::m_pColourBuffer = nullptr;
         Rasterizer_n::m_pDepthBuffer = nullptr;
         Rasterizer_n::m_ScreenPitch = 0;
         m_ColourBuffer = nullptr;
         m_DepthBuffer = nullptr;
+        m_Width = 0;
+        m_Height = 0;
+        resetclipping();
         apply_viewport_rect(m_Width, m_Height);
         return;
     }
