@@ -80,45 +80,14 @@ public:
     // With `strict`, every failure throws RuntimeException; otherwise ok()
     // tells whether the surface info was obtained.
     locked_surface(JNIEnv* env, jobject component, jint version, bool takeAwtLock, bool strict) : m_Env(env) {
-        std::memset(&m_Awt, 0, sizeof m_Awt);
-        m_Awt.version = version;
-        if (!env || !component || env->IsSameObject(component, nullptr)) {
-            if (strict) throw new RuntimeException("canvas component is gone");
-            return;
+        const char* failure = acquire(component, version, takeAwtLock);
+        if (failure && strict) {
+            release();  // a throwing constructor runs no destructor
+            throw new RuntimeException(failure);
         }
-        if (JAWT_GetAWT(env, &m_Awt) == JNI_FALSE) {
-            if (strict) throw new RuntimeException("AWT native interface unavailable");
-            return;
-        }
-        if (takeAwtLock) {
-            m_Awt.Lock(env);
-            m_AwtLocked = true;
-        }
-        m_Surface = m_Awt.GetDrawingSurface(env, component);
-        if (!m_Surface) {
-            if (strict) throw new RuntimeException("canvas has no drawing surface (not displayable?)");
-            return;
-        }
-        jint lock = m_Surface->Lock(m_Surface);
-        if (lock & JAWT_LOCK_ERROR) {
-            if (strict) throw new RuntimeException("cannot lock the canvas drawing surface");
-            return;
-        }
-        m_SurfaceLocked = true;
-        m_Info = m_Surface->GetDrawingSurfaceInfo(m_Surface);
-        if (!m_Info || !m_Info->platformInfo) {
-            if (strict) throw new RuntimeException("canvas drawing surface has no X11 info");
-            return;
-        }
-        m_X11 = static_cast<JAWT_X11DrawingSurfaceInfo*>(m_Info->platformInfo);
     }
 
-    ~locked_surface() {
-        if (m_Info) m_Surface->FreeDrawingSurfaceInfo(m_Info);
-        if (m_SurfaceLocked) m_Surface->Unlock(m_Surface);
-        if (m_Surface) m_Awt.FreeDrawingSurface(m_Surface);
-        if (m_AwtLocked) m_Awt.Unlock(m_Env);
-    }
+    ~locked_surface() { release(); }
 
     bool ok() const { return m_X11 != nullptr; }
     Display* display() const { return m_X11->display; }
@@ -126,6 +95,39 @@ public:
     int depth() const { return m_X11->depth; }
 
 private:
+    // Null when the X11 surface info was obtained, else what went wrong.
+    const char* acquire(jobject component, jint version, bool takeAwtLock) {
+        std::memset(&m_Awt, 0, sizeof m_Awt);
+        m_Awt.version = version;
+        if (!m_Env || !component || m_Env->IsSameObject(component, nullptr)) return "canvas component is gone";
+        if (JAWT_GetAWT(m_Env, &m_Awt) == JNI_FALSE) return "AWT native interface unavailable";
+        if (takeAwtLock) {
+            m_Awt.Lock(m_Env);
+            m_AwtLocked = true;
+        }
+        m_Surface = m_Awt.GetDrawingSurface(m_Env, component);
+        if (!m_Surface) return "canvas has no drawing surface";
+        if (m_Surface->Lock(m_Surface) & JAWT_LOCK_ERROR)
+            return "cannot lock the canvas drawing surface (no parent window?)";
+        m_SurfaceLocked = true;
+        m_Info = m_Surface->GetDrawingSurfaceInfo(m_Surface);
+        if (!m_Info || !m_Info->platformInfo) return "canvas drawing surface has no X11 info";
+        m_X11 = static_cast<JAWT_X11DrawingSurfaceInfo*>(m_Info->platformInfo);
+        return nullptr;
+    }
+
+    void release() {
+        if (m_Info) m_Surface->FreeDrawingSurfaceInfo(m_Info);
+        if (m_SurfaceLocked) m_Surface->Unlock(m_Surface);
+        if (m_Surface) m_Awt.FreeDrawingSurface(m_Surface);
+        if (m_AwtLocked) m_Awt.Unlock(m_Env);
+        m_Info = nullptr;
+        m_X11 = nullptr;
+        m_SurfaceLocked = false;
+        m_Surface = nullptr;
+        m_AwtLocked = false;
+    }
+
     JNIEnv* m_Env;
     JAWT m_Awt;
     bool m_AwtLocked = false;
