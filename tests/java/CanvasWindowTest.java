@@ -11,6 +11,7 @@ import java.awt.Toolkit;
 import org.junit.jupiter.api.AfterAll;
 import org.junit.jupiter.api.AfterEach;
 import org.junit.jupiter.api.BeforeAll;
+import org.junit.jupiter.api.Tag;
 import org.junit.jupiter.api.Test;
 import org.junit.jupiter.api.Timeout;
 
@@ -21,6 +22,7 @@ import org.junit.jupiter.api.Timeout;
  * -Dpavoqen.test.expect=shm|plain; "plain" covers both a server without
  * MIT-SHM and one that refuses the attach.
  */
+@Tag("window")
 @Timeout(60)
 class CanvasWindowTest {
     static final int W = 320, H = 240;

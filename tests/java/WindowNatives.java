@@ -8,8 +8,7 @@ import java.awt.Component;
  */
 final class WindowNatives {
     static {
-        Pavoqen.loadLibrary();
-        System.loadLibrary("pavoqen_testnatives");
+        TestSupport.loadTestNatives();
     }
 
     private WindowNatives() {}
