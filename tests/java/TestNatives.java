@@ -58,6 +58,7 @@ final class TestNatives {
     static native void pinTwo(int[] a, float[] b, int n);
     /** pin_count() seen inside the last pinThenRaise or pinTwo (-1: pinTwo pinned nothing). */
     static native int pinsInside();
+    /** Arrays pinned at this moment by the test library's wrappers (the product library counts its own). */
     static native int pinCount();
     /** {length, elements == null ? 1 : 0, change of pin_count} for a pinned null array. */
     static native int[] pinnedNull();

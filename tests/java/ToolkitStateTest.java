@@ -37,7 +37,6 @@ class ToolkitStateTest {
         sprite.M(sprite.nativeid);
         depth.za(depth.nativeid);
         tk.ma();
-        assertEquals(0, TestNatives.pinCount());
     }
 
     static int[] sentinel(int n) {
