@@ -39,14 +39,30 @@ int main(int argc, char** argv) {
     std::fflush(stdout);
     std::printf("\n");
     for (const bench_ratio& r : bench_ratios()) {
-        auto a = reporter.runs.find(r.ours), b = reporter.runs.find(r.peer);
-        if (a == reporter.runs.end() || b == reporter.runs.end()) continue;
+        auto a = reporter.runs.find(r.ours);
+        if (a == reporter.runs.end()) continue;
+        // The peer may name alternatives "A|B": the best of them counts.
+        bool found = false;
+        double peerTime = 0, peerCounter = 0;
+        size_t from = 0;
+        while (from <= r.peer.size()) {
+            size_t bar = r.peer.find('|', from);
+            if (bar == std::string::npos) bar = r.peer.size();
+            auto b = reporter.runs.find(r.peer.substr(from, bar - from));
+            from = bar + 1;
+            if (b == reporter.runs.end()) continue;
+            double t = b->second.time, c = r.counter.empty() ? 0 : b->second.counters[r.counter];
+            if (!found || t < peerTime) peerTime = t;
+            if (!found || c > peerCounter) peerCounter = c;
+            found = true;
+        }
+        if (!found) continue;
         double value;
         if (r.counter.empty()) {
-            value = a->second.time > 0 ? b->second.time / a->second.time : 0;
+            value = a->second.time > 0 ? peerTime / a->second.time : 0;
         } else {
-            double x = a->second.counters[r.counter], y = b->second.counters[r.counter];
-            value = y > 0 ? x / y : 0;
+            double x = a->second.counters[r.counter];
+            value = peerCounter > 0 ? x / peerCounter : 0;
         }
         std::printf("ratio %s %.2f\n", r.name.c_str(), value);
     }

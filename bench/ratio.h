@@ -5,6 +5,8 @@
 // iteration (both must do the same work per iteration): ratio = peer / ours.
 // PAVOQEN_RATIO_COUNTER(name, ours, peer, counter) compares a rate counter
 // (for example "items_per_second"): ratio = ours / peer.
+// The peer may list alternatives separated by '|' ("BM_A|BM_B"); the best of
+// them (shortest time, highest counter) is the one compared.
 #pragma once
 
 #include <string>

@@ -82,16 +82,15 @@ struct blend_mode {
 
 struct add_mode {
     static constexpr bool reads_dest = true;
-    explicit add_mode(uint32_t s) : src(s), vsrc(_mm_set1_epi32(int(s))) {}
+    explicit add_mode(uint32_t s)
+        : src(s), vrgb(_mm_set1_epi32(int(s & 0xFFFFFFu))), valpha(_mm_set1_epi32(int(s & 0xFF000000u))) {}
     uint32_t operator()(uint32_t d) const { return add_pixel(d, src); }
-    __m128i op4(__m128i d) const {
-        const __m128i alpha = _mm_set1_epi32(int(0xFF000000u));
-        __m128i sat = _mm_adds_epu8(d, vsrc);
-        __m128i wrap = _mm_add_epi8(d, vsrc);
-        return _mm_or_si128(_mm_and_si128(alpha, wrap), _mm_andnot_si128(alpha, sat));
-    }
+    // Colour bytes: saturating add of the source's colour channels (its alpha
+    // byte zeroed, so the destination alpha passes unchanged); then the source
+    // alpha is added to the top byte, where a carry leaves the word.
+    __m128i op4(__m128i d) const { return _mm_add_epi32(_mm_adds_epu8(d, vrgb), valpha); }
     uint32_t src;
-    __m128i vsrc;
+    __m128i vrgb, valpha;
 };
 
 inline bool valid_mode(unsigned int mode) { return mode <= 2; }
@@ -119,11 +118,31 @@ inline bool aligned16(const void* p) { return (reinterpret_cast<uintptr_t>(p) & 
 // One row of n pixels through the mode: scalar head to a 16-byte boundary,
 // four pixels at a time, scalar tail.
 template <class M>
-inline void fill_row(uint32_t* p, ptrdiff_t n, const M& m) {
+inline void fill_row(uint32_t* p, ptrdiff_t n, const M& mode) {
+    // A local copy: stores through p cannot alias it, so its vectors stay in registers.
+    const M m(mode);
     while (n > 0 && !aligned16(p)) {
         *p = m(*p);
         ++p;
         --n;
+    }
+    // sixteen pixels a step while they last, then four
+    for (; n >= 16; n -= 16, p += 16) {
+        __m128i* q = reinterpret_cast<__m128i*>(p);
+        if constexpr (M::reads_dest) {
+            const __m128i a = _mm_load_si128(q), b = _mm_load_si128(q + 1);
+            const __m128i c = _mm_load_si128(q + 2), d = _mm_load_si128(q + 3);
+            _mm_store_si128(q, m.op4(a));
+            _mm_store_si128(q + 1, m.op4(b));
+            _mm_store_si128(q + 2, m.op4(c));
+            _mm_store_si128(q + 3, m.op4(d));
+        } else {
+            const __m128i v = m.op4(_mm_setzero_si128());
+            _mm_store_si128(q, v);
+            _mm_store_si128(q + 1, v);
+            _mm_store_si128(q + 2, v);
+            _mm_store_si128(q + 3, v);
+        }
     }
     for (; n >= 4; n -= 4, p += 4) {
         __m128i* q = reinterpret_cast<__m128i*>(p);
@@ -138,7 +157,8 @@ inline void fill_row(uint32_t* p, ptrdiff_t n, const M& m) {
 // Same, but a pixel changes only where the depth element beside it (same
 // index in `z`) is greater than `depth`.
 template <class M>
-inline void fill_row_depth(uint32_t* p, const float* z, ptrdiff_t n, float depth, const M& m) {
+inline void fill_row_depth(uint32_t* p, const float* z, ptrdiff_t n, float depth, const M& mode) {
+    const M m(mode);
     while (n > 0 && !aligned16(p)) {
         if (*z > depth) *p = m(*p);
         ++p;
