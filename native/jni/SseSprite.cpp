@@ -31,6 +31,31 @@ void grab_rect(toolkit& t, Sprite_c& s, int x, int y, int w, int h, int screenX,
     s.CopyRect(r.dx, r.dy, uint32_t(r.w), uint32_t(r.h), cb + (intptr_t)r.sy * t.m_Width + r.sx, t.m_Width, key);
 }
 
+Sprite_c::RenderParams_s render_params(int x, int y, float depth, jint colour, int width, int height) {
+    Sprite_c::RenderParams_s p;
+    p.x = x;
+    p.y = y;
+    p.depth = depth;
+    p.colour = uint32_t(colour);
+    p.width = width;
+    p.height = height;
+    p.mask = nullptr;
+    p.maskx = p.masky = 0;
+    return p;
+}
+
+Sprite_c::ParallelogramRenderParams_s parallelogram_params(float x0, float y0, float x1, float y1, float x2, float y2,
+                                                          jint colour) {
+    Sprite_c::ParallelogramRenderParams_s p;
+    p.x0 = x0, p.x1 = x1, p.x2 = x2;
+    p.y0 = y0, p.y1 = y1, p.y2 = y2;
+    p.unused = 0;
+    p.colour = uint32_t(colour);
+    p.mask = nullptr;
+    p.maskx = p.masky = 0;
+    return p;
+}
+
 }  // namespace
 
 // Grab of a screen rectangle into a new sprite. Exported under its decorated
@@ -183,6 +208,58 @@ JNIEXPORT void JNICALL Java_fa_na(JNIEnv* env, jobject, jlong sprite, jint x, ji
         CheckRectElements(w, h, offset, stride, px.length);
         s.CopyRect(x, y, uint32_t(w), uint32_t(h), reinterpret_cast<const uint32_t*>(px.data()) + offset, stride,
                    false);
+    });
+}
+
+// ---- drawing ---------------------------------------------------------------
+
+JNIEXPORT void JNICALL Java_fa_Y(JNIEnv* env, jobject, jlong sprite, jint x, jint y, jint op, jint colour,
+                                 jint blend) {
+    guarded(env, [&] {
+        const Sprite_c& s = sprite_of(sprite);
+        toolkit& t = tk();
+        if (!t.m_ColourBuffer) return;
+        Sprite_c::RenderParams_s p = render_params(x, y, 0.0f, colour, 0, 0);
+        s.Draw(t, op, blend, p);
+    });
+}
+
+JNIEXPORT void JNICALL Java_fa_ha(JNIEnv* env, jobject, jlong sprite, jint x, jint y, jint width, jint height, jint op,
+                                  jint colour, jint blend) {
+    guarded(env, [&] {
+        const Sprite_c& s = sprite_of(sprite);
+        toolkit& t = tk();
+        if (!t.m_ColourBuffer) return;
+        s.DrawScaled(t, op, blend, render_params(x, y, 0.0f, colour, width, height));
+    });
+}
+
+JNIEXPORT void JNICALL Java_fa_G(JNIEnv* env, jobject, jlong sprite, jint x, jint y, jint depth, jint width,
+                                 jint height, jint op, jint colour, jint blend) {
+    guarded(env, [&] {
+        const Sprite_c& s = sprite_of(sprite);
+        toolkit& t = tk();
+        s.DrawScaledDepth(t, op, blend, render_params(x, y, float(depth), colour, width, height));
+    });
+}
+
+JNIEXPORT void JNICALL Java_fa_aa(JNIEnv* env, jobject, jlong sprite, jint x, jint y, jint width, jint height, jint op,
+                                  jint colour, jint blend) {
+    guarded(env, [&] {
+        const Sprite_c& s = sprite_of(sprite);
+        toolkit& t = tk();
+        if (!t.m_ColourBuffer) return;
+        s.DrawTiled(t, op, blend, render_params(x, y, 0.0f, colour, width, height));
+    });
+}
+
+JNIEXPORT void JNICALL Java_fa_e(JNIEnv* env, jobject, jlong sprite, jfloat x0, jfloat y0, jfloat x1, jfloat y1,
+                                 jfloat x2, jfloat y2, jint op, jint colour, jint blend) {
+    guarded(env, [&] {
+        const Sprite_c& s = sprite_of(sprite);
+        toolkit& t = tk();
+        if (!t.m_ColourBuffer) return;
+        s.DrawParallelogram(t, op, blend, parallelogram_params(x0, y0, x1, y1, x2, y2, colour));
     });
 }
 

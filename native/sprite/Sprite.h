@@ -6,8 +6,75 @@
 
 #include <cstdint>
 
+class toolkit;
+class clippingmask;
+
 class Sprite_c {
 public:
+    // What is done to each source pixel with the parameter colour col.
+    enum ColourOp_e {
+        ColourOp_Modulate = 0,  // src x col >> 8 per channel
+        ColourOp_None = 1,
+        ColourOp_Tint = 2,      // (src x a >> 8) + (col x (255 - a) >> 8), a = alpha of col
+        ColourOp_Add = 3,       // min(src + col, 255)
+        ColourOp_Subtract = 4,  // max(src - col, 0)
+    };
+    // How the (operated) source pixel meets the destination.
+    enum BlendMode_e {
+        SpriteBlend_Replace = 0,
+        SpriteBlend_Alpha = 1,  // (src x A + dst x (256 - A)) >> 8 per channel, A = source alpha
+        SpriteBlend_Add = 2,    // min(src + dst, 255) per channel
+    };
+
+    struct RenderParams_s {
+        int32_t x;  // destination of the full (untrimmed) box
+        int32_t y;
+        float depth;      // depth-tested variants
+        uint32_t colour;  // col of the colour operation
+        int32_t width;    // destination size (scaled and tiled variants)
+        int32_t height;
+        const clippingmask* mask;  // masked variants
+        int32_t maskx;
+        int32_t masky;
+    };
+
+    // Corners P0 = (x0, y0) (top-left of the full box), P1 = (x1, y1)
+    // (top-right) and P2 = (x2, y2) (bottom-left).
+    struct ParallelogramRenderParams_s {
+        float x0, x1, x2;
+        float y0, y1, y2;
+        int32_t unused;
+        uint32_t colour;
+        const clippingmask* mask;
+        int32_t maskx;
+        int32_t masky;
+    };
+
+    // Axis-aligned drawing into the toolkit's current colour buffer, clipped
+    // to its clipping rectangle. Switches: Scaled (the full box drawn at
+    // width x height, nearest sampling), Masked (confined to the clipping mask
+    // placed at (maskx, masky)), ColourWrite (false: nothing is written),
+    // DepthTest (drawn only where depth <= the depth buffer value; the depth
+    // buffer is not written).
+    template <int Op, int Blend, bool Scaled, bool Masked, bool ColourWrite, bool DepthTest>
+    void Render(toolkit& tk, const RenderParams_s& p) const;
+    // Repeats the sprite from (x, y) over width x height.
+    template <int Op, int Blend>
+    void RenderTiled(toolkit& tk, const RenderParams_s& p) const;
+    // Maps the sprite onto a parallelogram (rotation, shear, scale).
+    template <int Op, int Blend, bool Masked>
+    void RenderParallelogram(toolkit& tk, const ParallelogramRenderParams_s& p) const;
+
+    // Entry-level dispatch: the instantiation for (op, blend) is chosen once;
+    // an op outside 0-4 or a blend outside 0-2 draws nothing.
+    void Draw(toolkit& tk, int op, int blend, const RenderParams_s& p) const;
+    void DrawScaled(toolkit& tk, int op, int blend, const RenderParams_s& p) const;
+    // Scaled and depth-tested when the target has a depth buffer (without a
+    // colour buffer nothing is written); plain scaled without one.
+    void DrawScaledDepth(toolkit& tk, int op, int blend, const RenderParams_s& p) const;
+    void DrawTiled(toolkit& tk, int op, int blend, const RenderParams_s& p) const;
+    void DrawParallelogram(toolkit& tk, int op, int blend, const ParallelogramRenderParams_s& p) const;
+
     Sprite_c();
     ~Sprite_c();
 
