@@ -7,7 +7,6 @@
 
 #include <cmath>
 #include <cstdint>
-#include <vector>
 
 #include "render/toolkit.h"
 #include "sprite/Sprite.h"
@@ -191,11 +190,23 @@ void RenderUnscaledAt(const Target_s& g, const Sprite_c& s, long long ox, long l
     }
 }
 
-// Scratch list of source columns of one scaled call, per thread.
-std::vector<int>& column_scratch() {
-    static thread_local std::vector<int> cols;
-    return cols;
-}
+// Scratch list of source columns of one scaled call, per thread (grown, never
+// shrunk).
+struct ColumnScratch_s {
+    int* data = nullptr;
+    size_t capacity = 0;
+    ~ColumnScratch_s() { delete[] data; }
+    int* get(size_t n) {
+        if (n > capacity) {
+            delete[] data;
+            data = nullptr;
+            data = new int[n];
+            capacity = n;
+        }
+        return data;
+    }
+};
+thread_local ColumnScratch_s column_scratch;
 
 template <int Op, int Blend, bool Masked, bool ColourWrite, bool DepthTest>
 void RenderScaledImpl(const Target_s& g, const Sprite_c& s, const RenderParams_s& p, const Consts_s& k) {
@@ -218,8 +229,7 @@ void RenderScaledImpl(const Target_s& g, const Sprite_c& s, const RenderParams_s
     // nearest source column of each destination column: trunc(i x step)
     const float stepx = float(s.Width) / float(dw), stepy = float(s.Height) / float(dh);
     const int lastCol = int(s.Width) - 1, lastRow = int(s.Height) - 1;
-    std::vector<int>& cols = column_scratch();
-    cols.resize(size_t(x1 - x0));
+    int* cols = column_scratch.get(size_t(x1 - x0));
     for (long long x = x0; x < x1; ++x) {
         int c = int(float(x - dl) * stepx);
         cols[size_t(x - x0)] = c < lastCol ? c : lastCol;
@@ -230,7 +240,7 @@ void RenderScaledImpl(const Target_s& g, const Sprite_c& s, const RenderParams_s
         if (!rows.span(y, a, b)) continue;
         int r = int(float(y - dt) * stepy);
         if (r > lastRow) r = lastRow;
-        FetchColumns_s f{s.Pixels + (long long)r * s.Pitch, cols.data() + (a - x0)};
+        FetchColumns_s f{s.Pixels + (long long)r * s.Pitch, cols + (a - x0)};
         const float* z = DepthTest ? g.depth + y * g.pitch + a : nullptr;
         DrawRow<Op, Blend, DepthTest>(g.colour + y * g.pitch + a, z, p.depth, int(b - a), f, k);
     }
