@@ -243,6 +243,20 @@ JNIEXPORT void JNICALL Java_fa_G(JNIEnv* env, jobject, jlong sprite, jint x, jin
     });
 }
 
+JNIEXPORT void JNICALL Java_fa_o(JNIEnv* env, jobject, jlong sprite, jint x, jint y, jlong mask, jint maskx,
+                                 jint masky) {
+    guarded(env, [&] {
+        const Sprite_c& s = sprite_of(sprite);
+        toolkit& t = tk();
+        if (!t.m_ColourBuffer) return;
+        Sprite_c::RenderParams_s p = render_params(x, y, 0.0f, 0, 0, 0);
+        p.mask = from_id<clippingmask>(mask);
+        p.maskx = maskx;
+        p.masky = masky;
+        s.DrawMasked(t, p);
+    });
+}
+
 JNIEXPORT void JNICALL Java_fa_aa(JNIEnv* env, jobject, jlong sprite, jint x, jint y, jint width, jint height, jint op,
                                   jint colour, jint blend) {
     guarded(env, [&] {
@@ -260,6 +274,20 @@ JNIEXPORT void JNICALL Java_fa_e(JNIEnv* env, jobject, jlong sprite, jfloat x0, 
         toolkit& t = tk();
         if (!t.m_ColourBuffer) return;
         s.DrawParallelogram(t, op, blend, parallelogram_params(x0, y0, x1, y1, x2, y2, colour));
+    });
+}
+
+JNIEXPORT void JNICALL Java_fa_FA(JNIEnv* env, jobject, jlong sprite, jfloat x0, jfloat y0, jfloat x1, jfloat y1,
+                                  jfloat x2, jfloat y2, jint, jlong mask, jint maskx, jint masky, jboolean replace) {
+    guarded(env, [&] {
+        const Sprite_c& s = sprite_of(sprite);
+        toolkit& t = tk();
+        if (!t.m_ColourBuffer) return;
+        Sprite_c::ParallelogramRenderParams_s p = parallelogram_params(x0, y0, x1, y1, x2, y2, 0);
+        p.mask = from_id<clippingmask>(mask);
+        p.maskx = maskx;
+        p.masky = masky;
+        s.DrawParallelogramMasked(t, jtrue(replace), p);
     });
 }
 

@@ -74,6 +74,11 @@ public:
     void DrawScaledDepth(toolkit& tk, int op, int blend, const RenderParams_s& p) const;
     void DrawTiled(toolkit& tk, int op, int blend, const RenderParams_s& p) const;
     void DrawParallelogram(toolkit& tk, int op, int blend, const ParallelogramRenderParams_s& p) const;
+    // Unscaled, colour unchanged, alpha-blended, confined to p.mask (a null
+    // mask confines nothing).
+    void DrawMasked(toolkit& tk, const RenderParams_s& p) const;
+    // Colour unchanged, replaced or alpha-blended, confined to p.mask.
+    void DrawParallelogramMasked(toolkit& tk, bool replace, const ParallelogramRenderParams_s& p) const;
 
     Sprite_c();
     ~Sprite_c();

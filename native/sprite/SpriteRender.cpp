@@ -11,6 +11,7 @@
 #include "render/toolkit.h"
 #include "sprite/Sprite.h"
 #include "sprite/SpritePixel.h"
+#include "text/clippingmask.h"
 
 using namespace SpritePixel_n;
 
@@ -70,6 +71,24 @@ struct RowSpans_s<false> {
         x0 = l;
         x1 = r;
         return x1 > x0;
+    }
+};
+
+// Confined to the mask placed at (maskx, masky): the rows it covers, and on
+// each the mask's span cut to the object's range. A null mask confines nothing.
+template <>
+struct RowSpans_s<true> {
+    mask_placement m;
+    RowSpans_s(const clippingmask* mask, int maskx, int masky, long long l, long long t, long long r, long long b)
+        : m(mask, maskx, masky, int(l), int(t), int(r), int(b)) {}
+    long long first_row() const { return m.first_row(); }
+    long long end_row() const { return m.end_row(); }
+    bool span(long long y, long long& x0, long long& x1) const {
+        int a, b;
+        if (!m.span(int(y), a, b)) return false;
+        x0 = a;
+        x1 = b;
+        return true;
     }
 };
 
@@ -417,6 +436,9 @@ PAVOQEN_SPRITE_OPS(PAVOQEN_SPRITE_RENDER, true, false, true, false)
 PAVOQEN_SPRITE_OPS(PAVOQEN_SPRITE_RENDER, true, false, false, true)
 PAVOQEN_SPRITE_OPS(PAVOQEN_SPRITE_RENDER, true, false, true, true)
 PAVOQEN_SPRITE_OPS(PAVOQEN_SPRITE_OTHERS, 0)
+template void Sprite_c::Render<1, 1, false, true, true, false>(toolkit&, const RenderParams_s&) const;
+template void Sprite_c::RenderParallelogram<1, 0, true>(toolkit&, const ParallelogramRenderParams_s&) const;
+template void Sprite_c::RenderParallelogram<1, 1, true>(toolkit&, const ParallelogramRenderParams_s&) const;
 
 namespace {
 
@@ -463,4 +485,13 @@ void Sprite_c::DrawTiled(toolkit& tk, int op, int blend, const RenderParams_s& p
 
 void Sprite_c::DrawParallelogram(toolkit& tk, int op, int blend, const ParallelogramRenderParams_s& p) const {
     if (valid_modes(op, blend)) (this->*kParallelogram[op][blend])(tk, p);
+}
+
+void Sprite_c::DrawMasked(toolkit& tk, const RenderParams_s& p) const { Render<1, 1, false, true, true, false>(tk, p); }
+
+void Sprite_c::DrawParallelogramMasked(toolkit& tk, bool replace, const ParallelogramRenderParams_s& p) const {
+    if (replace)
+        RenderParallelogram<1, 0, true>(tk, p);
+    else
+        RenderParallelogram<1, 1, true>(tk, p);
 }

@@ -14,6 +14,8 @@
 #include "render/toolkit.h"
 #include "sprite/Sprite.h"
 #include "sprite/SpritePixel.h"
+#include "text/clippingmask.h"
+#include "util/memorymanager/memorymanager.h"
 
 namespace {
 
@@ -539,6 +541,97 @@ TEST_F(SpriteRender, ParallelogramWithBadCornersDrawsNothing) {
     s.OffsetLeft = -4;  // full width 0
     s.DrawParallelogram(*sc.t, 1, 0, corners(0, 0, 8, 0, 0, 8, 0));
     for (int i = 0; i < 256; ++i) ASSERT_EQ(sc.px()[i], 9u) << i;
+}
+
+// ---- masked ----------------------------------------------------------------------------
+
+struct RandomMask {
+    std::vector<int> starts, lengths;
+    int x, y;
+    RandomMask(std::mt19937& rng) {
+        int rows = int(rng() % 30);
+        for (int r = 0; r < rows; ++r) {
+            starts.push_back(int(rng() % 40) - 10);
+            lengths.push_back(int(rng() % 30) - 4);  // some empty or negative
+        }
+        x = int(rng() % 20) - 8;
+        y = int(rng() % 24) - 8;
+    }
+    bool covers(long long X, long long Y) const {
+        long long r = Y - y;
+        if (r < 0 || r >= (long long)starts.size()) return false;
+        long long a = x + starts[size_t(r)];
+        return X >= a && X < a + lengths[size_t(r)];
+    }
+};
+
+TEST_F(SpriteRender, MaskedMatchesPerPixelReference) {
+    memorymanager pool(1 << 16);
+    for (int seed = 0; seed < 120; ++seed) {
+        SCOPED_TRACE(seed);
+        std::mt19937 rng(6000 + seed);
+        Scene sc(37, 23);
+        sc.fill_random(rng);
+        int w = 1 + rng() % 30, h = 1 + rng() % 12;
+        Source src(rng, w, h, rng() % 4, rng() % 2);
+        Sprite_c& s = src.sprite;
+        s.OffsetLeft = rng() % 3, s.OffsetTop = rng() % 3;
+        RandomMask m(rng);
+        clippingmask mask(&pool, 0, 0, m.starts.data(), int(m.starts.size()), m.lengths.data(), int(m.lengths.size()));
+        if (seed % 3 == 0) sc.clip(int(rng() % 10), int(rng() % 8), 20 + int(rng() % 20), 12 + int(rng() % 12));
+        int x = int(rng() % 50) - 15, y = int(rng() % 34) - 10;
+        std::vector<uint32_t> expect = sc.pixels();
+        for (int j = 0; j < h; ++j)
+            for (int i = 0; i < w; ++i) {
+                long long X = x + s.OffsetLeft + i, Y = y + s.OffsetTop + j;
+                if (!sc.in_clip(X, Y) || !m.covers(X, Y)) continue;
+                uint32_t& d = expect[size_t(Y * 37 + X)];
+                d = ref_pixel(1, 1, src.at(i, j), d, 0);
+            }
+        Sprite_c::RenderParams_s p = params(x, y, 0);
+        p.mask = &mask, p.maskx = m.x, p.masky = m.y;
+        s.DrawMasked(*sc.t, p);
+        ASSERT_EQ(sc.pixels(), expect);
+
+        // the parallelogram form, axis-aligned, replaced and blended
+        for (int replace = 0; replace < 2; ++replace) {
+            sc.fill_random(rng);
+            expect = sc.pixels();
+            for (int j = 0; j < h; ++j)
+                for (int i = 0; i < w; ++i) {
+                    long long X = x + s.OffsetLeft + i, Y = y + s.OffsetTop + j;
+                    if (!sc.in_clip(X, Y) || !m.covers(X, Y)) continue;
+                    uint32_t& d = expect[size_t(Y * 37 + X)];
+                    d = ref_pixel(1, replace ? 0 : 1, src.at(i, j), d, 0);
+                }
+            float fw = float(s.FullWidth()), fh = float(s.FullHeight());
+            Sprite_c::ParallelogramRenderParams_s q = corners(float(x), float(y), x + fw, float(y), float(x), y + fh, 0);
+            q.mask = &mask, q.maskx = m.x, q.masky = m.y;
+            s.DrawParallelogramMasked(*sc.t, replace != 0, q);
+            ASSERT_EQ(sc.pixels(), expect) << "replace " << replace;
+        }
+    }
+}
+
+TEST_F(SpriteRender, NullOrEmptyMask) {
+    memorymanager pool(4096);
+    Scene sc(8, 8);
+    std::fill(sc.px(), sc.px() + 64, 0u);
+    Sprite_c s;
+    s.Allocate(2, 2);
+    std::fill(s.Pixels, s.Pixels + 4, 0xFF0000FFu);
+    std::vector<int> zero(8, 0);
+    clippingmask empty(&pool, 8, 8, zero.data(), 8, zero.data(), 8);  // every row covers nothing
+    Sprite_c::RenderParams_s p = params(1, 1, 0);
+    p.mask = &empty;
+    s.DrawMasked(*sc.t, p);
+    for (int i = 0; i < 64; ++i) ASSERT_EQ(sc.px()[i], 0u);
+    p.mask = nullptr;  // no mask: drawn whole
+    s.DrawMasked(*sc.t, p);
+    const uint32_t blended = ref_pixel(1, 1, 0xFF0000FFu, 0, 0);
+    EXPECT_EQ(sc.px()[9], blended);
+    EXPECT_EQ(sc.px()[18], blended);
+    EXPECT_EQ(sc.px()[19], 0u);
 }
 
 }  // namespace
