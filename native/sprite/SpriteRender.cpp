@@ -457,34 +457,41 @@ const RenderFn kScaledDepth[5][3] = PAVOQEN_TABLE(Render, true, false, true, tru
 const RenderFn kTiled[5][3] = PAVOQEN_TABLE(RenderTiled);
 const ParallelogramFn kParallelogram[5][3] = PAVOQEN_TABLE(RenderParallelogram, false);
 
-inline bool valid_modes(int op, int blend) { return op >= 0 && op <= 4 && blend >= 0 && blend <= 2; }
+// The one dispatch of a call: the instantiation for (op, blend), or nothing
+// for modes outside the tables.
+template <class Fn, class P>
+inline void dispatch(const Fn (&table)[5][3], const Sprite_c& s, toolkit& tk, unsigned op, unsigned blend,
+                     const P& p) {
+    if (op >= 5u || blend >= 3u) return;
+    const Fn fn = table[op][blend];
+    (s.*fn)(tk, p);
+}
 
 }  // namespace
 
 void Sprite_c::Draw(toolkit& tk, int op, int blend, const RenderParams_s& p) const {
-    if (valid_modes(op, blend)) (this->*kUnscaled[op][blend])(tk, p);
+    dispatch(kUnscaled, *this, tk, unsigned(op), unsigned(blend), p);
 }
 
 void Sprite_c::DrawScaled(toolkit& tk, int op, int blend, const RenderParams_s& p) const {
-    if (valid_modes(op, blend)) (this->*kScaled[op][blend])(tk, p);
+    dispatch(kScaled, *this, tk, unsigned(op), unsigned(blend), p);
 }
 
 void Sprite_c::DrawScaledDepth(toolkit& tk, int op, int blend, const RenderParams_s& p) const {
-    if (!valid_modes(op, blend)) return;
     if (tk.m_DepthBuffer && tk.m_ColourBuffer)
-        (this->*kScaledDepth[op][blend])(tk, p);
+        dispatch(kScaledDepth, *this, tk, unsigned(op), unsigned(blend), p);
     else if (tk.m_DepthBuffer)
-        (this->*kScaledDepthOnly[op][blend])(tk, p);
+        dispatch(kScaledDepthOnly, *this, tk, unsigned(op), unsigned(blend), p);
     else if (tk.m_ColourBuffer)
-        (this->*kScaled[op][blend])(tk, p);
+        dispatch(kScaled, *this, tk, unsigned(op), unsigned(blend), p);
 }
 
 void Sprite_c::DrawTiled(toolkit& tk, int op, int blend, const RenderParams_s& p) const {
-    if (valid_modes(op, blend)) (this->*kTiled[op][blend])(tk, p);
+    dispatch(kTiled, *this, tk, unsigned(op), unsigned(blend), p);
 }
 
 void Sprite_c::DrawParallelogram(toolkit& tk, int op, int blend, const ParallelogramRenderParams_s& p) const {
-    if (valid_modes(op, blend)) (this->*kParallelogram[op][blend])(tk, p);
+    dispatch(kParallelogram, *this, tk, unsigned(op), unsigned(blend), p);
 }
 
 void Sprite_c::DrawMasked(toolkit& tk, const RenderParams_s& p) const { Render<1, 1, false, true, true, false>(tk, p); }
