@@ -8,6 +8,9 @@
 #      attach the client's segments, so the attach is refused
 #                                                 -Dpavoqen.test.expect=plain
 #      (left out, with a note, where unshare --ipc is not permitted)
+# On the first server the demo client also runs in its window: the test card
+# must appear on the screen (read with xwd + netpbm; the screenshot is kept as
+# <library dir>/demo_window.png) and the demo must finish cleanly.
 # Fails when a test fails, when the JVM reports JNI misuse, or when no test ran.
 #   run_window_tests.sh <java> <junit console jar> <test jar> <product jar> <library dir>
 set -uo pipefail
@@ -76,8 +79,49 @@ run() {  # run <label> <expect>
     fi
 }
 
+# Pixel (x, y) of a PNM file as "R G B".
+pixel() {
+    pamcut -left "$2" -top "$3" -width 1 -height 1 "$1" | pnmtoplainpnm | tail -n +4 \
+        | tr -s ' \n' ' ' | sed 's/^ //; s/ $//'
+}
+
+demo_window() {
+    local log=$tmp/demo.log
+    echo "=== window tests: demo client in a window (display $DISPLAY)"
+    DISPLAY=$DISPLAY timeout 120 "$java" -Djava.library.path="$libdir" -cp "$productjar" Demo --window \
+        --size 800x600 --frames 300 --fps 60 >"$log" 2>&1 &
+    local pid=$! seen=0
+    # The window sits at the screen's top-left (no window manager). Bars 0, 1,
+    # 5 and 6 of the test card: white, yellow, red, blue.
+    local shot=$tmp/screen.pnm
+    for _ in $(seq 50); do
+        sleep 0.2
+        DISPLAY=$DISPLAY xwd -root -silent 2>/dev/null | xwdtopnm >"$shot" 2>/dev/null || continue
+        if [ "$(pixel "$shot" 50 90)" = "255 255 255" ] && [ "$(pixel "$shot" 150 90)" = "255 255 0" ] &&
+           [ "$(pixel "$shot" 550 90)" = "255 0 0" ] && [ "$(pixel "$shot" 650 90)" = "0 0 255" ]; then
+            seen=1
+            pnmtopng "$shot" >"$libdir/demo_window.png" 2>/dev/null
+            break
+        fi
+        kill -0 "$pid" 2>/dev/null || break
+    done
+    wait "$pid"
+    local status=$?
+    cat "$log"
+    if [ $seen -ne 1 ]; then
+        echo "window tests (demo): the test card never appeared on the screen" >&2
+        failed=1
+    elif [ $status -ne 0 ] || ! grep -q 'frames in' "$log"; then
+        echo "window tests (demo): the demo failed (status $status)" >&2
+        failed=1
+    else
+        echo "window tests (demo): test card on screen, screenshot $libdir/demo_window.png"
+    fi
+}
+
 start_xvfb -- || exit 1
 run "MIT-SHM" shm
+demo_window
 stop_xvfb
 
 start_xvfb -- -extension MIT-SHM || exit 1
