@@ -1,0 +1,126 @@
+import java.awt.image.BufferedImage;
+import java.io.File;
+import java.io.IOException;
+
+import javax.imageio.ImageIO;
+
+/**
+ * A sprite test card: one sprite drawn with every colour operation (rows:
+ * modulate, none, tint, add, subtract) in every blend mode (columns: replace,
+ * alpha, add), then scaled, tiled, rotated and sheared as parallelograms, and
+ * confined by a clipping mask. Drawn into an offscreen sprite and written as a
+ * PNG.
+ */
+public final class SpriteCard {
+    private SpriteCard() {}
+
+    /** A size x size ball: a colour wheel fading to transparent at the rim. */
+    static int[] ball(int size) {
+        int[] px = new int[size * size];
+        double r = size / 2.0;
+        for (int y = 0; y < size; ++y)
+            for (int x = 0; x < size; ++x) {
+                double dx = x + 0.5 - r, dy = y + 0.5 - r, d = Math.sqrt(dx * dx + dy * dy) / r;
+                if (d >= 1) continue;
+                double hue = Math.atan2(dy, dx) / (2 * Math.PI) + 0.5;
+                int rgb = java.awt.Color.HSBtoRGB((float) hue, (float) Math.min(1, d * 1.5), 1f) & 0xFFFFFF;
+                int a = (int) (255 * Math.min(1, (1 - d) * 3));
+                px[y * size + x] = a << 24 | rgb;
+            }
+        return px;
+    }
+
+    /** Draws the card over the current target of {@code tk} (at least 320 x 240). */
+    public static void draw(ja tk, ba pool, int w, int h) {
+        tk.L();
+        tk.ba(3, 0);
+        // a checkerboard, so that blending shows
+        for (int y = 0; y < h; y += 8)
+            for (int x = 0; x < w; x += 8) tk.B(x, y, 8, 8, ((x ^ y) & 8) != 0 ? 0xFF505860 : 0xFF303438, 0);
+        fa ball = new fa();
+        fa bars = new fa();
+        int[] px = ball(24);
+        ball.RA(null, px, 0, 24, 24, 24, false);
+        int[] stripes = new int[8 * 8];
+        for (int i = 0; i < stripes.length; ++i)
+            stripes[i] = ((i % 8) < 4) ^ ((i / 8) < 4) ? 0xC0FFC040 : 0x4040A0FF;
+        bars.RA(null, stripes, 0, 8, 8, 8, false);
+        wa mask = new wa();
+        int rows = 40;
+        int[] starts = new int[rows], lengths = new int[rows];
+        for (int r = 0; r < rows; ++r) {
+            starts[r] = Math.abs(r - 20);
+            lengths[r] = 40 - 2 * Math.abs(r - 20);
+        }
+        mask.l(null, pool, 40, 40, starts, lengths);
+        try {
+            long b = ball.nativeid;
+            // 5 colour operations x 3 blend modes
+            int colour = 0x90FF8040;
+            for (int op = 0; op < 5; ++op)
+                for (int blend = 0; blend < 3; ++blend) ball.Y(b, 6 + blend * 28, 6 + op * 28, op, colour, blend);
+            // scaled up and down, and depth-tested against a cleared depth buffer
+            ball.ha(b, 96, 6, 64, 64, 1, 0, 1);
+            ball.ha(b, 164, 6, 12, 12, 1, 0, 1);
+            ball.G(b, 164, 24, 10, 40, 40, 2, 0x80FFFFFF, 1);
+            // tiled over a strip, added
+            bars.aa(bars.nativeid, 96, 76, 100, 20, 1, 0, 1);
+            // parallelograms: the stripes upright and rotated by 30 and 60 degrees; the ball sheared
+            for (int k = 0; k < 3; ++k) {
+                double a = k * Math.PI / 6, s = 36;
+                float cx = 230 + k * 30, cy = 40 + k * 50;
+                float x0 = (float) (cx - s / 2 * Math.cos(a) + s / 2 * Math.sin(a));
+                float y0 = (float) (cy - s / 2 * Math.sin(a) - s / 2 * Math.cos(a));
+                bars.e(bars.nativeid, x0, y0, x0 + (float) (s * Math.cos(a)), y0 + (float) (s * Math.sin(a)),
+                        x0 - (float) (s * Math.sin(a)), y0 + (float) (s * Math.cos(a)), 1, 0, 1);
+            }
+            ball.e(b, 96, 110, 156, 110, 126, 150, 0, 0xFFFFFFFF, 1);
+            // confined by a diamond mask: blended, and as a masked parallelogram replaced
+            ball.o(b, 170, 110, mask.nativeid, 170, 110);
+            bars.FA(bars.nativeid, 220, 170, 300, 190, 200, 230, 0, mask.nativeid, 230, 180, true);
+        } finally {
+            mask.ma();
+            ball.M(ball.nativeid);
+            bars.M(bars.nativeid);
+        }
+    }
+
+    /** Writes the card at 320 x 240 to the file named by the first argument (default out/sprites.png). */
+    public static void main(String[] args) throws IOException {
+        Pavoqen.loadLibrary();
+        ja tk = Pavoqen.createToolkit(null, 0);
+        try {
+            File png = new File(args.length > 0 ? args[0] : "out/sprites.png");
+            renderPng(tk, 320, 240, png);
+            System.out.println("pavoqen: sprite card written to " + png);
+        } finally {
+            tk.ma();
+        }
+    }
+
+    /** Renders the card offscreen at width x height and writes it to {@code png}. */
+    public static void renderPng(ja tk, int width, int height, File png) throws IOException {
+        ba pool = new ba();
+        pool.sa(0, 1 << 16);
+        fa target = new fa();
+        oa depth = new oa();
+        try {
+            target.UA(0, width, height);
+            depth.g(width, height);
+            tk.d(target.nativeid, depth.nativeid);
+            draw(tk, pool, width, height);
+            int[] pixels = tk.E(0, 0, width, height);
+            tk.d(0, 0);
+            BufferedImage img = new BufferedImage(width, height, BufferedImage.TYPE_INT_RGB);
+            img.setRGB(0, 0, width, height, pixels, 0, width);
+            File dir = png.getAbsoluteFile().getParentFile();
+            if (dir != null) dir.mkdirs();
+            ImageIO.write(img, "png", png);
+        } finally {
+            tk.d(0, 0);
+            if (target.nativeid != 0) target.M(target.nativeid);
+            if (depth.nativeid != 0) depth.za(depth.nativeid);
+            pool.ma();
+        }
+    }
+}
