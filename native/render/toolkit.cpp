@@ -5,6 +5,7 @@
 
 #include <cmath>
 #include <cstdint>
+#include <cstring>
 #include <new>
 
 #include "jni/Exception.h"
@@ -38,14 +39,14 @@ toolkit::toolkit(toolkit_callbacks* callbacks, bool withTextures, int texturearg
     for (int i = 0; i < 4; ++i) m_PointLightPositions[i] = _mm_setzero_ps();
     mymath::init();
     colourutils::init();
-    if (withTextures) m_Textures = create_texturecache(texturearg);
+    if (withTextures) m_Textures = texturecache::create(this, texturearg);
     // flush-to-zero and denormals-are-zero on the constructing thread
     _mm_setcsr(_mm_getcsr() | 0x8040);
 }
 
 toolkit::~toolkit() {
     if (m_Textures) {
-        destroy_texturecache(m_Textures);
+        texturecache::destroy(m_Textures);
         m_Textures = nullptr;
     }
     delete m_Callbacks;
@@ -258,15 +259,17 @@ void toolkit::getclipping(int* out) const {
 
 // --- other ----------------------------------------------------------------
 
+// Content moves by o elements (towards higher addresses for o > 0); elements
+// not overwritten keep their values. memmove gives exactly the element-wise
+// copy in the safe direction.
 template <class T>
 static void scroll_linear(T* p, long long n, long long o) {
     if (!p || o == 0) return;
     if (o >= n || -o >= n) return;  // nothing of the buffer stays inside it
-    if (o < 0) {
-        for (long long i = 0; i < n + o; ++i) p[i] = p[i - o];
-    } else {
-        for (long long i = n - o - 1; i >= 0; --i) p[i + o] = p[i];
-    }
+    if (o < 0)
+        std::memmove(p, p - o, size_t(n + o) * sizeof(T));
+    else
+        std::memmove(p + o, p, size_t(n - o) * sizeof(T));
 }
 
 void toolkit::scroll(int dx, int dy) {
@@ -277,5 +280,24 @@ void toolkit::scroll(int dx, int dy) {
 }
 
 void toolkit::service(int ms) {
-    if (m_Textures) texturecache_service(m_Textures, ms);
+    if (m_Textures) m_Textures->service(ms);
 }
+
+// --- textures ---------------------------------------------------------------
+
+static texturecache& need_textures(texturecache* t) {
+    if (!t) throw new IllegalStateException("toolkit has no texture cache");
+    return *t;
+}
+
+void toolkit::upload_texture(unsigned short id, const int* pixels, const texturemetrics& m) {
+    need_textures(m_Textures).upload_texture(id, pixels, m);
+}
+
+void toolkit::upload_texturemetrics(unsigned short id, const texturemetrics& m) {
+    need_textures(m_Textures).upload_texturemetrics(id, m);
+}
+
+textureslot* toolkit::gettex(unsigned short id) { return m_Textures ? m_Textures->gettex(id) : nullptr; }
+
+texturemetrics* toolkit::getmetrics(unsigned short id) { return m_Textures ? m_Textures->getmetrics(id) : nullptr; }

@@ -11,6 +11,8 @@
 
 class memorymanager;
 class texturecache;
+struct texturemetrics;
+struct textureslot;
 class Sprite_c;
 class DepthBuffer_c;
 class canvas;
@@ -85,6 +87,13 @@ public:
 
     // --- textures ---
     void service(int ms);
+    // 128 x 128 ARGB pixels into the texture cache (IllegalStateException
+    // when the toolkit was created without one).
+    void upload_texture(unsigned short id, const int* pixels, const texturemetrics& m);
+    void upload_texturemetrics(unsigned short id, const texturemetrics& m);
+    // The cache's gettex / getmetrics; null without a cache.
+    textureslot* gettex(unsigned short id);
+    texturemetrics* getmetrics(unsigned short id);
     void quit() { m_Quitting = true; }
 
     // Scroll colour and depth buffers by dy*width + dx pixels (linear offset).
