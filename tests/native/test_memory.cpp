@@ -1,6 +1,8 @@
 // Memory pools, holders, typed arrays and the aligned allocators.
 #include <gtest/gtest.h>
 
+#include <xmmintrin.h>
+
 #include <cstdint>
 #include <cstring>
 #include <functional>
@@ -303,6 +305,7 @@ public:
 };
 
 TEST(MemoryPool, JavaPoolAsksTheToolkitToCollect) {
+    unsigned int mxcsr = _mm_getcsr();
     auto* cb = new recording_callbacks();
     toolkit* tk = toolkit::create(cb, false, 0);
     {
@@ -323,6 +326,7 @@ TEST(MemoryPool, JavaPoolAsksTheToolkitToCollect) {
         cb->on_collect = nullptr;
     }
     toolkit::destroy(tk);
+    _mm_setcsr(mxcsr);
 }
 
 TEST(SharedArray, CountsAccessAndSharing) {
