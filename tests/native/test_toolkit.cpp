@@ -15,7 +15,7 @@
 
 namespace {
 
-class Toolkit : public ::testing::Test {
+class ToolkitState : public ::testing::Test {
 protected:
     void SetUp() override {
         mxcsr = _mm_getcsr();
@@ -43,7 +43,7 @@ protected:
     std::unique_ptr<memory_canvas> canvas_;
 };
 
-TEST_F(Toolkit, ConstructionState) {
+TEST_F(ToolkitState, ConstructionState) {
     EXPECT_EQ(_mm_getcsr() & 0x8040u, 0x8040u);
     EXPECT_EQ(tk->m_ShadowResolution, 8);
     EXPECT_EQ(tk->m_ShadowResolutionShift, 3);
@@ -54,7 +54,7 @@ TEST_F(Toolkit, ConstructionState) {
     EXPECT_EQ(clip(), (std::vector<int>{0, 0, 0, 0}));
 }
 
-TEST_F(Toolkit, CanvasActivationClearsAndSetsTheTarget) {
+TEST_F(ToolkitState, CanvasActivationClearsAndSetsTheTarget) {
     memory_canvas c(64, 48);
     for (int i = 0; i < 64 * 48; ++i) {
         c.colourbuffer()[i] = 0x12345678;
@@ -78,7 +78,7 @@ TEST_F(Toolkit, CanvasActivationClearsAndSetsTheTarget) {
     EXPECT_EQ(tk->m_ColourBuffer, nullptr);
 }
 
-TEST_F(Toolkit, ClippingAndSubClipping) {
+TEST_F(ToolkitState, ClippingAndSubClipping) {
     attach(640, 480);
     tk->setclipping(-5, -5, 10000, 10000);
     EXPECT_EQ(clip(), (std::vector<int>{0, 0, 640, 480}));
@@ -97,7 +97,7 @@ TEST_F(Toolkit, ClippingAndSubClipping) {
     EXPECT_EQ(clip(), (std::vector<int>{0, 0, 640, 480}));
 }
 
-TEST_F(Toolkit, ShadowResolutionIsAPowerOfTwo) {
+TEST_F(ToolkitState, ShadowResolutionIsAPowerOfTwo) {
     const int cases[][3] = {{100, 64, 6}, {1, 1, 0}, {0, 1, 0}, {-7, 1, 0}, {2, 2, 1}, {3, 2, 1}, {4096, 4096, 12},
                             {0x7FFFFFFF, 1 << 30, 30}};
     for (const auto& c : cases) {
@@ -113,7 +113,7 @@ float lane(__m128 v, int i) {
     return f[i];
 }
 
-TEST_F(Toolkit, PointLightsAreClampedToFour) {
+TEST_F(ToolkitState, PointLightsAreClampedToFour) {
     std::vector<int> lights;
     std::vector<float> intensity;
     for (int i = 0; i < 7; ++i) {
@@ -141,7 +141,7 @@ TEST_F(Toolkit, PointLightsAreClampedToFour) {
     EXPECT_EQ(tk->m_PointLightCount, -3);
 }
 
-TEST_F(Toolkit, SunDirectionAndShadowSteps) {
+TEST_F(ToolkitState, SunDirectionAndShadowSteps) {
     tk->set_globalsun(0x00FF8010, 0.5f, 1.5f, 3.0f, 4.0f, 0.0f);
     EXPECT_EQ(tk->m_SunColour[0], 0xFF);
     EXPECT_EQ(tk->m_SunColour[1], 0x80);
@@ -173,7 +173,7 @@ float expected_fog_start(const Matrix_c& p, float distance) {
     return ndc * ((vp.MaxZ - vp.MinZ) * 0.5f) + ((vp.MaxZ - vp.MinZ) * 0.5f + vp.MinZ);
 }
 
-TEST_F(Toolkit, ProjectionSetsDepthRangeAndMovesTheFogStart) {
+TEST_F(ToolkitState, ProjectionSetsDepthRangeAndMovesTheFogStart) {
     attach(320, 200);
     Rasterizer_n::Viewport_s vp = *Rasterizer_n::GetViewport();
     vp.MinZ = 0.0f;
@@ -208,7 +208,7 @@ TEST_F(Toolkit, ProjectionSetsDepthRangeAndMovesTheFogStart) {
     EXPECT_NEAR(atNegative, 1.0f, 1e-5);
 }
 
-TEST_F(Toolkit, UnderwaterModeSavesAndRestoresTheFogColour) {
+TEST_F(ToolkitState, UnderwaterModeSavesAndRestoresTheFogColour) {
     tk->set_fog(0xFF112233, 100);
     tk->underwatermode_enable(-200, 0x80FF4020, 400, 12345);
     EXPECT_TRUE(tk->m_Underwater);
@@ -240,7 +240,7 @@ void reference_scroll(std::vector<T>& p, long long o) {
         for (long long i = n - o - 1; i >= 0; --i) p[size_t(i + o)] = p[size_t(i)];
 }
 
-TEST_F(Toolkit, ScrollMovesBothBuffersEitherWay) {
+TEST_F(ToolkitState, ScrollMovesBothBuffersEitherWay) {
     attach(7, 5);
     const int n = 35;
     const int moves[][2] = {{1, 0}, {0, 1}, {-2, 0}, {3, -1}, {0, -4}, {-1, 2}, {0, 0}, {0, 5}, {-40, 0}, {6, 0}};
