@@ -31,18 +31,26 @@ JNIEnv* jni_toolkit_callbacks::get_env() const {
 bool jni_toolkit_callbacks::request_texture(unsigned short id) {
     JNIEnv* env = get_env();
     if (!env) return false;
-    return env->CallBooleanMethod(m_Peer, m_RequestTexture, (jshort)id) == JNI_TRUE;
+    jboolean provided = env->CallBooleanMethod(m_Peer, m_RequestTexture, (jshort)id);
+    // A Java exception thrown by the callback stays pending for the caller of
+    // the entry; the texture counts as not provided.
+    if (env->ExceptionCheck()) return false;
+    return provided == JNI_TRUE;
 }
 
 void jni_toolkit_callbacks::garbagecollect() {
     JNIEnv* env = get_env();
-    if (env) env->CallVoidMethod(m_Peer, m_GarbageCollect);
+    if (!env) return;
+    env->CallVoidMethod(m_Peer, m_GarbageCollect);
+    env->ExceptionCheck();  // an exception stays pending for the caller of the entry
 }
 
 void* jni_toolkit_callbacks::createshadow() {
     JNIEnv* env = get_env();
     if (!env) return nullptr;
-    return env->CallObjectMethod(m_Peer, m_CreateShadow);
+    jobject shadow = env->CallObjectMethod(m_Peer, m_CreateShadow);
+    if (env->ExceptionCheck()) return nullptr;
+    return shadow;
 }
 
 JNIEnv* toolkit_env() {
