@@ -162,9 +162,14 @@ void texturecache::upload_texturemetrics(unsigned short id, const texturemetrics
 void texturecache::upload_texture(unsigned short id, const int* pixels, const texturemetrics& m) {
     std::lock_guard<std::mutex> lock(m_Lock);
     // A second upload of a resident id replaces it in place; otherwise the
-    // least recently used slot is the victim. The slot is not moved in the
-    // chain: the fetch that asked for the texture does that.
+    // least recently used slot is the victim. The slot becomes the most
+    // recently used, so that textures uploaded one after another (preloading,
+    // or requests on several threads) do not evict each other.
     int target = m_IdToSlot[id] != kNone ? m_IdToSlot[id] : m_LruHead;
+    if (target != m_LruTail) {
+        unlink_lru(target);
+        append_lru(target);
+    }
     if (m_SlotToId[target] >= 0) m_IdToSlot[m_SlotToId[target]] = kNone;
     m_SlotToId[target] = id;
     m_IdToSlot[id] = (unsigned char)target;

@@ -59,11 +59,11 @@ struct alignas(16) textureslot {
 
 class alignas(16) texturecache {
 public:
-    static const int kSlots = 200;
-    static const int kSize = 128;           // texels per side
-    static const int kStride = 256;         // texels per store row
-    static const unsigned char kNone = 255; // "not resident" / end of the LRU chain
-    static const unsigned int kStoreBytes = 100u * 128u * 256u * 4u;
+    static constexpr int kSlots = 200;
+    static constexpr int kSize = 128;           // texels per side
+    static constexpr int kStride = 256;         // texels per store row
+    static constexpr unsigned char kNone = 255; // "not resident" / end of the LRU chain
+    static constexpr unsigned int kStoreBytes = 100u * 128u * 256u * 4u;
 
     // Allocated 16-byte aligned. `idcount` ids have metrics; negative counts
     // throw IllegalArgumentException.
@@ -105,6 +105,7 @@ public:
     int slot_of(unsigned short id) const { return m_IdToSlot[id] == kNone ? -1 : m_IdToSlot[id]; }
     int lru_head() const { return m_LruHead; }
     int lru_tail() const { return m_LruTail; }
+    int lru_next(int s) const { return m_Next[s] == kNone ? -1 : m_Next[s]; }
     int queued_count() const { return m_UpdateCount; }
     textureslot* slot(int s) { return &m_Slots[s]; }
 

@@ -8,7 +8,9 @@
 #include <cstring>
 #include <functional>
 #include <memory>
+#include <mutex>
 #include <random>
+#include <thread>
 #include <vector>
 
 #include "jni/Exception.h"
@@ -23,13 +25,17 @@ namespace {
 class texture_callbacks : public toolkit_callbacks {
 public:
     bool request_texture(unsigned short id) override {
-        requests.push_back(id);
+        {
+            std::lock_guard<std::mutex> lock(m);
+            requests.push_back(id);
+        }
         return answer ? answer(id) : false;
     }
     void garbagecollect() override {}
     void* createshadow() override { return nullptr; }
     std::vector<int> requests;
     std::function<bool(unsigned short)> answer;
+    std::mutex m;
 };
 
 texturemetrics metrics(int scrollu = 0, int scrollv = 0, bool wrapu = false, bool wrapv = false,
@@ -121,6 +127,48 @@ TEST_F(TextureCache, EvictsLeastRecentlyUsedAndRequestsAgain) {
     cache->upload_texture(0, px.data(), metrics());
     EXPECT_EQ(cache->slot_of(0), slotOf0);
     EXPECT_EQ(cache->slot_of(3), 3);  // the oldest slot was not taken
+    // Uploads outside requests do not evict each other.
+    cache->upload_texture(500, px.data(), metrics());
+    cache->upload_texture(501, px.data(), metrics());
+    EXPECT_EQ(cache->slot_of(500), 3);
+    EXPECT_EQ(cache->slot_of(501), 4);
+    EXPECT_EQ(cache->lru_tail(), 4);
+    EXPECT_EQ(cache->lru_head(), 5);
+}
+
+TEST_F(TextureCache, ConcurrentFetchesKeepTheChainConsistent) {
+    std::vector<std::thread> threads;
+    for (int t = 0; t < 4; ++t)
+        threads.emplace_back([this, t] {
+            std::mt19937 rng(77 + t);
+            for (int i = 0; i < 300; ++i) {
+                unsigned short id = (unsigned short)(rng() % 260);
+                textureslot* s = cache->gettex(id);
+                ASSERT_TRUE(s);
+            }
+        });
+    for (auto& th : threads) th.join();
+    // The chain runs through every slot once, from head to tail.
+    std::vector<int> seen(texturecache::kSlots, 0);
+    int s = cache->lru_head(), last = -1, n = 0;
+    for (; s != -1 && n <= texturecache::kSlots; s = cache->lru_next(s), ++n) {
+        ASSERT_EQ(seen[s]++, 0);
+        last = s;
+    }
+    EXPECT_EQ(n, texturecache::kSlots);
+    EXPECT_EQ(last, cache->lru_tail());
+    // Resident ids map to distinct slots whose record names them.
+    std::vector<int> owner(texturecache::kSlots, -1);
+    int resident = 0;
+    for (int id = 0; id < 260; ++id) {
+        int slot = cache->slot_of((unsigned short)id);
+        if (slot < 0) continue;
+        ++resident;
+        EXPECT_EQ(owner[slot], -1);
+        owner[slot] = id;
+        EXPECT_EQ(cache->slot(slot)->metrics.averagehsl, id);
+    }
+    EXPECT_EQ(resident, texturecache::kSlots);
 }
 
 TEST_F(TextureCache, RefusedAndInvalidRequests) {
@@ -216,8 +264,7 @@ float lane3(__m128 v) { return _mm_cvtss_f32(_mm_shuffle_ps(v, v, _MM_SHUFFLE(3,
 
 TEST_F(TextureCache, ScrollOffsets) {
     std::vector<int> px(128 * 128, 0x10203040);
-    // An upload goes to the least recently used slot without moving it, so
-    // textures arrive through requests, as they do from Java.
+    // Textures arrive through requests, as they do from Java.
     cb->answer = [&](unsigned short id) {
         cache->upload_texture(id, px.data(), id == 10 ? metrics(64, -32) : id == 12 ? metrics(-64, 3) : metrics());
         return true;

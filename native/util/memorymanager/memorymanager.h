@@ -101,11 +101,11 @@ private:
 class memorymanager {
 public:
     // Bytes allocated beyond the usable capacity and never handed out.
-    static const unsigned int kTail = 204800;
+    static constexpr unsigned int kTail = 204800;
     // Largest usable capacity: the buffer size and every offset fit a signed 32-bit int.
-    static const unsigned int kMaxCapacity = 0x7FFFFFFFu - kTail;
+    static constexpr unsigned int kMaxCapacity = 0x7FFFFFFFu - kTail;
     // A pool whose free tail is below this after a collection grows at once.
-    static const unsigned int kLowWater = 307200;
+    static constexpr unsigned int kLowWater = 307200;
 
     // Throws IllegalArgumentException for a capacity beyond kMaxCapacity and
     // RuntimeException when the buffer cannot be allocated.
