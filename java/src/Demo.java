@@ -144,7 +144,8 @@ public final class Demo {
         while (!canvas.isShowing() && System.nanoTime() < deadline) Thread.sleep(10);
         if (!canvas.isShowing()) throw new IllegalStateException("the demo window never appeared");
 
-        ja tk = Pavoqen.createToolkit(null, 0);
+        ja tk = Pavoqen.createToolkit(DemoTextures.SOURCE, DemoTextures.IDS);
+        DemoTextures.preload(tk, 4);
         DemoScene scene = new DemoScene(tk);
         System.out.println("demo: window, layers " + scene.layerNames());
         int w = canvas.getWidth(), h = canvas.getHeight();
@@ -196,7 +197,8 @@ public final class Demo {
 
     private void runHeadless() throws IOException {
         int n = frames > 0 ? frames : 60;
-        ja tk = Pavoqen.createToolkit(null, 0);
+        ja tk = Pavoqen.createToolkit(DemoTextures.SOURCE, DemoTextures.IDS);
+        DemoTextures.preload(tk, 4);
         DemoScene scene = new DemoScene(tk);
         System.out.println("demo: headless, layers " + scene.layerNames());
         fa target = new fa();
