@@ -5,6 +5,8 @@ namespace Rasterizer_n {
 unsigned int* m_pColourBuffer = nullptr;
 float* m_pDepthBuffer = nullptr;
 int m_ScreenPitch = 0;
+int m_TargetWidth = 0;
+int m_TargetHeight = 0;
 float m_ZNear = 0.0f;
 float m_ZFar = 0.0f;
 int m_ZWriteEnabled = 1;
@@ -16,6 +18,14 @@ alignas(16) __m128i m_TriangleCuller = {0, 0};
 Viewport_s m_Viewport = {0, 0, 0, 0, 0.0f, 0.0f};
 alignas(16) __m128 m_ViewportMul = {0, 0, 0, 0};
 alignas(16) __m128 m_ViewportAdd = {0, 0, 0, 0};
+
+void SetTarget(unsigned int* colour, float* depth, int pitch, int width, int height) {
+    m_pColourBuffer = colour;
+    m_pDepthBuffer = depth;
+    m_ScreenPitch = pitch;
+    m_TargetWidth = width;
+    m_TargetHeight = height;
+}
 
 void SetZWrite(bool enabled) { m_ZWriteEnabled = enabled ? 1 : 0; }
 

@@ -21,6 +21,11 @@ struct Viewport_s {
 extern unsigned int* m_pColourBuffer;  // 32-bit ARGB (an 8-bit mask while a shadow is rasterised)
 extern float* m_pDepthBuffer;
 extern int m_ScreenPitch;  // row stride of both buffers, in elements
+// Size of the current target in pixels. Triangles are drawn only inside the
+// viewport and inside this rectangle, so a viewport larger than the target
+// never writes outside the buffers.
+extern int m_TargetWidth;
+extern int m_TargetHeight;
 extern float m_ZNear;
 extern float m_ZFar;
 extern int m_ZWriteEnabled;
@@ -33,6 +38,8 @@ extern Viewport_s m_Viewport;
 extern __m128 m_ViewportMul;
 extern __m128 m_ViewportAdd;
 
+// Stores the buffer pointers, pitch and target size (the viewport is not touched).
+void SetTarget(unsigned int* colour, float* depth, int pitch, int width, int height);
 void SetZWrite(bool enabled);
 Viewport_s* GetViewport();
 void SetViewport(const Viewport_s& vp);

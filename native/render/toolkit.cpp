@@ -73,9 +73,7 @@ void toolkit::apply_viewport_rect(int width, int height) {
 }
 
 void toolkit::setup_backbuffer(unsigned int* colour, float* depth, int, int, int pitch) {
-    Rasterizer_n::m_pColourBuffer = colour;
-    Rasterizer_n::m_pDepthBuffer = depth;
-    Rasterizer_n::m_ScreenPitch = pitch;
+    Rasterizer_n::SetTarget(colour, depth, pitch, m_Width, m_Height);
     apply_viewport_rect(m_Width, m_Height);
 }
 
@@ -97,9 +95,7 @@ void toolkit::set_active_canvas(canvas* c) {
     if (!c) {
         // No target: a zero-sized one with an empty clip, so that drawing
         // before the next activation writes nothing through the null buffers.
-        Rasterizer_n::m_pColourBuffer = nullptr;
-        Rasterizer_n::m_pDepthBuffer = nullptr;
-        Rasterizer_n::m_ScreenPitch = 0;
+        Rasterizer_n::SetTarget(nullptr, nullptr, 0, 0, 0);
         m_ColourBuffer = nullptr;
         m_DepthBuffer = nullptr;
         m_Width = 0;

@@ -1,0 +1,28 @@
+// RenderTriangle instantiations: textured model faces, repeat addressing, distance fog and both fogs.
+// Columns: shade, U, V, texture transform, fog, blend, transparent, map,
+// depth write, colour write, depth test.
+#include "render/RasterizerInst.h"
+
+#define VARIANTS(X) \
+    X( 2, 1, 1, 0, 2, 0, 0, 0, 1, 1, 0) \
+    X( 2, 1, 1, 0, 2, 0, 0, 0, 1, 1, 1) \
+    X( 2, 1, 1, 0, 2, 0, 1, 0, 1, 1, 0) \
+    X( 2, 1, 1, 0, 2, 0, 1, 0, 1, 1, 1) \
+    X( 2, 1, 1, 0, 2, 3, 0, 0, 1, 1, 0) \
+    X( 2, 1, 1, 0, 2, 3, 0, 0, 1, 1, 1) \
+    X( 2, 1, 1, 0, 2, 3, 1, 0, 1, 1, 0) \
+    X( 2, 1, 1, 0, 2, 3, 1, 0, 1, 1, 1) \
+    X( 2, 1, 1, 0, 2, 2, 0, 0, 1, 1, 0) \
+    X( 2, 1, 1, 0, 2, 2, 0, 0, 1, 1, 1) \
+    X( 2, 1, 1, 0, 3, 0, 0, 0, 1, 1, 0) \
+    X( 2, 1, 1, 0, 3, 0, 0, 0, 1, 1, 1) \
+    X( 2, 1, 1, 0, 3, 0, 1, 0, 1, 1, 0) \
+    X( 2, 1, 1, 0, 3, 0, 1, 0, 1, 1, 1) \
+    X( 2, 1, 1, 0, 3, 3, 0, 0, 1, 1, 0) \
+    X( 2, 1, 1, 0, 3, 3, 0, 0, 1, 1, 1) \
+    X( 2, 1, 1, 0, 3, 3, 1, 0, 1, 1, 0) \
+    X( 2, 1, 1, 0, 3, 3, 1, 0, 1, 1, 1) \
+    X( 2, 1, 1, 0, 3, 2, 0, 0, 0, 1, 0) \
+    X( 2, 1, 1, 0, 3, 2, 0, 0, 0, 1, 1) \
+
+RASTER_VARIANT_GROUP(RasterVariantsModelRepeatB, VARIANTS)
