@@ -54,4 +54,31 @@ RenderTriangleFn FindVariant(int shade, int addrU, int addrV, bool texTransform,
     return nullptr;
 }
 
+static __m128i SpreadColour(unsigned int c) {
+    // bytes B, G, R, A from the least significant up, each shifted left by 8
+    __m128i b = _mm_unpacklo_epi8(_mm_setzero_si128(), _mm_cvtsi32_si128(int(c)));
+    return b;
+}
+
+void RenderColouredTriangle(int x1, int y1, int x2, int y2, int x3, int y3, unsigned int colour1,
+                            unsigned int colour2, unsigned int colour3) {
+    Triangle_s t;
+    t.m_Positions[0] = _mm_setr_ps(float(x1), float(y1), 0.0f, 1.0f);
+    t.m_Positions[1] = _mm_setr_ps(float(x2), float(y2), 0.0f, 1.0f);
+    t.m_Positions[2] = _mm_setr_ps(float(x3), float(y3), 0.0f, 1.0f);
+    t.m_Colours[0] = SpreadColour(colour1);
+    t.m_Colours[1] = SpreadColour(colour2);
+    t.m_Colours[2] = SpreadColour(colour3);
+    const bool colour = m_pColourBuffer != nullptr, depth = m_pDepthBuffer != nullptr;
+    if (colour && !depth)
+        RenderTriangle<ShadeMode_Gouraud, TexAddress_Wrap, TexAddress_Wrap, false, FogMode_None, BlendMode_Opaque,
+                       false, false, false, true, false>(t);
+    else if (colour && depth)
+        RenderTriangle<ShadeMode_Gouraud, TexAddress_Wrap, TexAddress_Wrap, false, FogMode_None, BlendMode_Opaque,
+                       false, false, false, true, true>(t);
+    else if (depth)
+        RenderTriangle<ShadeMode_Gouraud, TexAddress_Wrap, TexAddress_Wrap, false, FogMode_None, BlendMode_Opaque,
+                       false, false, false, false, true>(t);
+}
+
 }  // namespace Rasterizer_n

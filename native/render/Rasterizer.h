@@ -100,3 +100,13 @@ RenderTriangleFn FindVariant(int shade, int addrU, int addrV, bool texTransform,
                              bool transparent, bool mapMod, bool depthWrite, bool colourWrite, bool depthTest);
 
 }  // namespace Rasterizer_n
+
+namespace Rasterizer_n {
+
+// A Gouraud-shaded triangle in screen coordinates (depth 0) with ARGB vertex
+// colours, drawn into the current targets: colour only, colour with the depth
+// test, depth test only, or nothing when there is no buffer.
+void RenderColouredTriangle(int x1, int y1, int x2, int y2, int x3, int y3, unsigned int colour1,
+                            unsigned int colour2, unsigned int colour3);
+
+}  // namespace Rasterizer_n
