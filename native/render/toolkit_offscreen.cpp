@@ -40,9 +40,7 @@ void toolkit::start_offscreen_render(Sprite_c* sprite, DepthBuffer_c* depth) {
         m_DepthBuffer = nullptr;
     }
     if (!sprite && !depth) m_Width = m_Height = 0;
-    Rasterizer_n::m_pColourBuffer = m_ColourBuffer;
-    Rasterizer_n::m_pDepthBuffer = m_DepthBuffer;
-    Rasterizer_n::m_ScreenPitch = pitch;
+    Rasterizer_n::SetTarget(m_ColourBuffer, m_DepthBuffer, pitch, m_Width, m_Height);
     resetclipping();
     resetviewport();
 }

@@ -1,0 +1,122 @@
+import static org.junit.jupiter.api.Assertions.*;
+
+import org.junit.jupiter.api.AfterEach;
+import org.junit.jupiter.api.BeforeAll;
+import org.junit.jupiter.api.BeforeEach;
+import org.junit.jupiter.api.Test;
+
+/**
+ * The thread resource peer: creation and destruction, coloured triangles and
+ * thick lines drawn into an offscreen target and read back.
+ */
+class ThreadResourceTest {
+    static final int W = 48, H = 32;
+
+    ja tk;
+    ba pool;
+    fa sprite;
+    oa depth;
+    a tr;
+
+    @BeforeAll
+    static void load() {
+        TestSupport.load();
+    }
+
+    @BeforeEach
+    void target() {
+        tk = new ja();
+        tk.q(null, 0);
+        pool = new ba();
+        pool.sa(0, 1 << 20);
+        sprite = new fa();
+        sprite.UA(0, W, H);
+        depth = new oa();
+        depth.g(W, H);
+        tk.d(sprite.nativeid, depth.nativeid);
+        tk.ba(3, 0);
+        tr = new a();
+        tr.ha(0, 0, 0, 1, 2);
+    }
+
+    @AfterEach
+    void release() {
+        if (tr.nativeid != 0) tr.R(tr.nativeid);
+        tk.d(0, 0);
+        sprite.M(sprite.nativeid);
+        depth.za(depth.nativeid);
+        pool.ma();
+        tk.ma();
+    }
+
+    int[] pixels() {
+        return tk.E(0, 0, W, H);
+    }
+
+    @Test
+    void createsAndDestroys() {
+        assertNotEquals(0, tr.nativeid);
+        tr.JA(tr.nativeid);
+        tr.UA(tr.nativeid);
+        a other = new a();
+        other.ha(7, 7, 7, 3, 4);
+        assertNotEquals(tr.nativeid, other.nativeid);
+        other.R(other.nativeid);
+        assertEquals(0, other.nativeid);
+        tr.R(tr.nativeid);
+        assertEquals(0, tr.nativeid);
+    }
+
+    @Test
+    void colouredTriangleFillsItsArea() {
+        int c = 0x80FF4020;
+        tr.ra(tr.nativeid, 0, 0, W, 0, 0, H, c, c, c);
+        int[] p = pixels();
+        assertEquals(c, p[2 * W + 2]);
+        assertEquals(c, p[10 * W + 20]);
+        assertEquals(0, p[(H - 1) * W + W - 1]);  // beyond the hypotenuse
+        // Gouraud: red at vertex 2's corner, blue at vertex 3's
+        tk.ba(3, 0);
+        tr.ra(tr.nativeid, 0, 0, W, 0, 0, H, 0xFF000000, 0xFFFF0000, 0xFF0000FF);
+        p = pixels();
+        assertTrue(((p[1 * W + 44] >> 16) & 0xFF) > 200);
+        assertTrue((p[29 * W + 1] & 0xFF) > 200);
+    }
+
+    @Test
+    void thickLineIsARectangle() {
+        tr.K(tr.nativeid, 0, 5, 10, 35, 10, 0xFF00FF00, 4, 0);
+        int[] p = pixels();
+        for (int y = 0; y < H; ++y)
+            for (int x = 0; x < W; ++x) {
+                boolean inside = y >= 8 && y < 12 && x >= 5 && x < 35;
+                assertEquals(inside, p[y * W + x] == 0xFF00FF00, x + "," + y);
+            }
+    }
+
+    @Test
+    void withoutBuffersNothingIsDrawnOrRaised() {
+        tk.d(0, 0);
+        tr.ra(tr.nativeid, 0, 0, W, 0, 0, H, -1, -1, -1);
+        tr.K(tr.nativeid, 0, 0, 0, W, H, -1, 10, 0);
+        tk.d(sprite.nativeid, depth.nativeid);
+        for (int v : pixels()) assertEquals(0, v);
+    }
+
+    @Test
+    void extremeCoordinatesStayInsideTheTarget() {
+        int[] e = {Integer.MIN_VALUE, -70000, -1, 0, 20, 70000, Integer.MAX_VALUE};
+        for (int i = 0; i < e.length; ++i)
+            for (int j = 0; j < e.length; ++j) {
+                tr.ra(tr.nativeid, e[i], e[j], e[j], e[i], 20, 20, -1, -1, -1);
+                tr.K(tr.nativeid, 0, e[i], e[j], e[j], e[i], 0xFF00FF00, e[(i + j) % e.length], 0);
+            }
+        assertEquals(W * H, pixels().length);
+    }
+
+    @Test
+    void zeroIdsRaiseNullPointerException() {
+        assertThrows(NullPointerException.class, () -> tr.K(0, 0, 0, 0, 10, 10, -1, 3, 0));
+        assertThrows(NullPointerException.class, () -> tr.JA(0));
+    }
+}
