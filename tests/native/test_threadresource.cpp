@@ -21,6 +21,9 @@ struct ToolkitTarget : ::testing::Test {
     void SetUp() override {
         tk = toolkit::create(nullptr, false, 0);
         Bind(true, true);
+        Clear();
+    }
+    void Clear() {
         for (int y = 0; y < tg.height; ++y)
             for (int x = 0; x < tg.pitch; ++x) {
                 tg.at(x, y) = 0x5A5A5A5Au;
@@ -116,7 +119,7 @@ TEST_F(ThickLine, VerticalAndDiagonalLinesCoverTheirAxis) {
         EXPECT_EQ(tg.at(32, y), 0xFF00FF00u) << y;
         EXPECT_NE(tg.at(40, y), 0xFF00FF00u) << y;
     }
-    SetUp();
+    Clear();
     tk->line_thick(*tr, 10, 10, 50, 50, 0xFFFF0000u, 8, 0);
     for (int k = 12; k < 48; ++k) EXPECT_EQ(tg.at(k, k), 0xFFFF0000u) << k;
     EXPECT_EQ(tg.at(50, 10), 0x5A5A5A5Au);
@@ -183,10 +186,11 @@ TEST_F(ColouredTriangle, ColoursInterpolateBetweenVertices) {
     EXPECT_EQ(left >> 24, 0xFFu);
 }
 
-// Draws the given triangles with a thread resource of its own, staging the
-// vertices in the resource's scratch region as models do.
-void DrawWith(toolkit& tk, const std::vector<Triangle_s>& tris, const Texture* tex, int firstRow) {
-    threadresource* tr = threadresource::create(tk, 0, 0);
+// Draws the given triangles with the thread's own resource, staging the
+// vertices in the resource's scratch region as models do. Resources are
+// created and destroyed while no thread draws.
+void DrawWith(toolkit& tk, threadresource* tr, const std::vector<Triangle_s>& tris, const Texture* tex,
+              int firstRow) {
     for (const Triangle_s& src : tris) {
         for (int i = 0; i < 3; ++i) tr->m_Vertices[i] = src.m_Positions[i];
         Triangle_s t = src;
@@ -199,7 +203,6 @@ void DrawWith(toolkit& tk, const std::vector<Triangle_s>& tris, const Texture* t
         int y = firstRow + 2 + int(_mm_cvtss_f32(_mm_shuffle_ps(src.m_Positions[1], src.m_Positions[1], 1))) % 120;
         tk.line_thick(*tr, int(_mm_cvtss_f32(src.m_Positions[0])), y, 200, y, 0xFF00FFFFu, 2, 0);
     }
-    threadresource::destroy(tr);
 }
 
 TEST(ThreadedDrawing, TwoThreadsInDisjointHalvesMatchOneThread) {
@@ -237,17 +240,21 @@ TEST(ThreadedDrawing, TwoThreadsInDisjointHalvesMatchOneThread) {
         SetViewportRect(0, 0, 256, 256);
         RecomputeDistanceFogParams(0.4f, 0xFF406080u);
     };
+    threadresource* tra = threadresource::create(*tk, 0, 0);
+    threadresource* trb = threadresource::create(*tk, 0, 0);
     bind(one);
     std::thread single([&] {
-        DrawWith(*tk, top, &tex, 0);
-        DrawWith(*tk, bottom, &tex, 128);
+        DrawWith(*tk, tra, top, &tex, 0);
+        DrawWith(*tk, tra, bottom, &tex, 128);
     });
     single.join();
     bind(two);
-    std::thread a([&] { DrawWith(*tk, top, &tex, 0); });
-    std::thread b([&] { DrawWith(*tk, bottom, &tex, 128); });
+    std::thread a([&] { DrawWith(*tk, tra, top, &tex, 0); });
+    std::thread b([&] { DrawWith(*tk, trb, bottom, &tex, 128); });
     a.join();
     b.join();
+    threadresource::destroy(tra);
+    threadresource::destroy(trb);
     bool inDepth = false;
     EXPECT_EQ(one.diff(two, inDepth), -1) << (inDepth ? "depth" : "colour");
     EXPECT_TRUE(two.guardsIntact());
