@@ -118,44 +118,48 @@ struct FetchColumns_s {
     }
 };
 
-// Source coordinates u, v in fixed point stepping along the row; samples
-// outside [0, ulimit) x [0, vlimit) are skipped. Arithmetic wraps (unsigned)
-// so that the same integers result in both forms.
+// Source coordinates u, v in fixed point stepping along the row. The caller
+// has cut the row to the pixels whose coordinates lie inside the stored
+// pixels, so every fetch is in range.
 struct FetchParallelogram_s {
-    static const bool MayReject = true;
+    static const bool MayReject = false;
     const uint32_t* pixels;
     long long pitch;
     int32_t u0, v0, du, dv;
-    int32_t ulimit, vlimit;
-    int32_t u_at(int i) const { return int32_t(uint32_t(u0) + uint32_t(i) * uint32_t(du)); }
-    int32_t v_at(int i) const { return int32_t(uint32_t(v0) + uint32_t(i) * uint32_t(dv)); }
     bool get1(int i, uint32_t& s) const {
-        int32_t u = u_at(i), v = v_at(i);
-        if (u < 0 || u >= ulimit || v < 0 || v >= vlimit) return false;
+        int32_t u = u0 + i * du, v = v0 + i * dv;
         s = pixels[(v >> pp_scaleshift) * pitch + (u >> pp_scaleshift)];
         return true;
     }
-    __m128i get4(int i, __m128i& valid) const {
-        const __m128i lanes = _mm_setr_epi32(0, 1, 2, 3);
-        __m128i u = _mm_add_epi32(_mm_set1_epi32(u_at(i)), mul_lanes(lanes, du));
-        __m128i v = _mm_add_epi32(_mm_set1_epi32(v_at(i)), mul_lanes(lanes, dv));
-        const __m128i minus1 = _mm_set1_epi32(-1);
-        valid = _mm_and_si128(_mm_and_si128(_mm_cmpgt_epi32(u, minus1), _mm_cmpgt_epi32(_mm_set1_epi32(ulimit), u)),
-                              _mm_and_si128(_mm_cmpgt_epi32(v, minus1), _mm_cmpgt_epi32(_mm_set1_epi32(vlimit), v)));
-        __m128i iu = _mm_and_si128(_mm_srai_epi32(u, pp_scaleshift), valid);
-        __m128i iv = _mm_and_si128(_mm_srai_epi32(v, pp_scaleshift), valid);
-        alignas(16) int32_t cu[4], cv[4];
-        _mm_store_si128(reinterpret_cast<__m128i*>(cu), iu);
-        _mm_store_si128(reinterpret_cast<__m128i*>(cv), iv);
-        return _mm_setr_epi32(int(pixels[cv[0] * pitch + cu[0]]), int(pixels[cv[1] * pitch + cu[1]]),
-                              int(pixels[cv[2] * pitch + cu[2]]), int(pixels[cv[3] * pitch + cu[3]]));
-    }
-    // (0, 1, 2, 3) x step with wrapping 32-bit products
-    static __m128i mul_lanes(__m128i, int32_t step) {
-        uint32_t s = uint32_t(step);
-        return _mm_setr_epi32(0, int(s), int(2u * s), int(3u * s));
+    __m128i get4(int i, __m128i&) const {
+        int32_t u = u0 + i * du, v = v0 + i * dv;
+        const uint32_t* p0 = pixels + (v >> pp_scaleshift) * pitch + (u >> pp_scaleshift);
+        u += du, v += dv;
+        const uint32_t* p1 = pixels + (v >> pp_scaleshift) * pitch + (u >> pp_scaleshift);
+        u += du, v += dv;
+        const uint32_t* p2 = pixels + (v >> pp_scaleshift) * pitch + (u >> pp_scaleshift);
+        u += du, v += dv;
+        const uint32_t* p3 = pixels + (v >> pp_scaleshift) * pitch + (u >> pp_scaleshift);
+        return _mm_setr_epi32(int(*p0), int(*p1), int(*p2), int(*p3));
     }
 };
+
+// Narrows [lo, hi) to the i with 0 <= c + i x d < limit (exact integers).
+inline void narrow_fixed(long long c, long long d, long long limit, long long& lo, long long& hi) {
+    auto floordiv = [](long long a, long long b) {  // b > 0
+        long long q = a / b;
+        return (a % b != 0 && a < 0) ? q - 1 : q;
+    };
+    if (d > 0) {
+        lo = max64(lo, -floordiv(c, d));            // ceil(-c / d)
+        hi = min64(hi, -floordiv(c - limit, d));    // ceil((limit - c) / d)
+    } else if (d < 0) {
+        hi = min64(hi, floordiv(c, -d) + 1);
+        lo = max64(lo, floordiv(c - limit, -d) + 1);
+    } else if (!(c >= 0 && c < limit)) {
+        hi = lo;
+    }
+}
 
 // ---- the row loop ------------------------------------------------------------
 
@@ -364,8 +368,7 @@ void RenderParallelogramImpl(const Target_s& g, const Sprite_c& s, const Paralle
     if (r1 <= r0) return;
     RowSpans_s<Masked> rows(p.mask, p.maskx, p.masky, g.l, r0, g.r, r1);
     const double coordLimit = double(kMaxParallelogramSource) * 2;
-    const FetchParallelogram_s base{s.Pixels, (long long)s.Pitch, 0, 0, du, dv, int32_t(s.Width << pp_scaleshift),
-                                    int32_t(s.Height << pp_scaleshift)};
+    const FetchParallelogram_s base{s.Pixels, (long long)s.Pitch, 0, 0, du, dv};
     for (long long y = rows.first_row(); y < rows.end_row(); ++y) {
         long long a, b;
         if (!rows.span(y, a, b)) continue;
@@ -384,10 +387,16 @@ void RenderParallelogramImpl(const Target_s& g, const Sprite_c& s, const Paralle
         const double t = double(a) + 0.5 - x0;
         const double u = t * dudx + yc * dudy, v = t * dvdx + yc * dvdy;
         if (!(std::fabs(u) <= coordLimit && std::fabs(v) <= coordLimit)) continue;
+        // the pixels whose fixed-point coordinate falls inside the stored pixels
+        const int32_t u0 = to_fixed(u), v0 = to_fixed(v);
+        long long i0 = 0, i1 = b - a;
+        narrow_fixed(u0, du, (long long)s.Width << pp_scaleshift, i0, i1);
+        narrow_fixed(v0, dv, (long long)s.Height << pp_scaleshift, i0, i1);
+        if (i1 <= i0) continue;
         FetchParallelogram_s f = base;
-        f.u0 = to_fixed(u);
-        f.v0 = to_fixed(v);
-        DrawRow<Op, Blend, false>(g.colour + y * g.pitch + a, nullptr, 0.0f, int(b - a), f, k);
+        f.u0 = int32_t(u0 + i0 * du);
+        f.v0 = int32_t(v0 + i0 * dv);
+        DrawRow<Op, Blend, false>(g.colour + y * g.pitch + a + i0, nullptr, 0.0f, int(i1 - i0), f, k);
     }
 }
 
