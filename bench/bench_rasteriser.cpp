@@ -49,7 +49,7 @@ struct Tri {
 std::vector<Tri> MakeTriangles(int area, int count) {
     Rng r;
     r.s += unsigned(area);
-    std::vector<Tri> out(size_t(count));
+    std::vector<Tri> out(static_cast<size_t>(count));
     for (Tri& t : out) {
         float a0 = r.uni(0.0f, 6.2831853f);
         float px[3], py[3];
