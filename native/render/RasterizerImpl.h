@@ -31,6 +31,8 @@ namespace Rasterizer_n {
 // caller passes (1e9 is exact in single precision).
 constexpr float kCoordLimit = 1.0e9f;
 constexpr int kClipLimit = 1 << 30;
+// Triangles of at most this many rows get their rows prefetched during set-up.
+constexpr int kPrefetchRows = 12;
 
 // Mask and lane tables shared by every span routine instantiation.
 struct RasterTables_c {
@@ -572,6 +574,33 @@ void RenderTriangle(const Triangle_s& t) {
     const int yM = _mm_cvtsi128_si32(_mm_srli_si128(yi, 4));
     const int yB = _mm_cvtsi128_si32(_mm_srli_si128(yi, 8));
     if (yB <= clip.y0 || yT >= clip.y1 || yT == yB) return;
+
+    if constexpr (Shade != ShadeMode_Mask) {
+        // Small triangles: fetch their rows' cache lines now, so that the
+        // memory latency overlaps the set-up arithmetic below.
+        const int r0 = yT > clip.y0 ? yT : clip.y0, r1 = yB < clip.y1 ? yB : clip.y1;
+        if (r1 - r0 <= kPrefetchRows) {
+            __m128 xr = _mm_unpacklo_ps(_mm_min_ps(_mm_min_ps(p0, p1), p2), _mm_max_ps(_mm_max_ps(p0, p1), p2));
+            __m128i xi = _mm_cvttps_epi32(ClampCoord(xr));
+            int xa = _mm_cvtsi128_si32(xi), xb = _mm_cvtsi128_si32(_mm_srli_si128(xi, 4)) + 1;
+            xa = xa > clip.x0 ? xa : clip.x0;
+            xb = xb < clip.x1 - 1 ? xb : clip.x1 - 1;
+            if (xb >= xa) {
+                const intptr_t pitch = m_ScreenPitch;
+                for (int row = r0; row < r1; ++row) {
+                    const intptr_t o = intptr_t(row) * pitch;
+                    if constexpr (ColourWrite) {
+                        _mm_prefetch(reinterpret_cast<const char*>(m_pColourBuffer + o + xa), _MM_HINT_T0);
+                        _mm_prefetch(reinterpret_cast<const char*>(m_pColourBuffer + o + xb), _MM_HINT_T0);
+                    }
+                    if constexpr (DepthTest) {
+                        _mm_prefetch(reinterpret_cast<const char*>(m_pDepthBuffer + o + xa), _MM_HINT_T0);
+                        _mm_prefetch(reinterpret_cast<const char*>(m_pDepthBuffer + o + xb), _MM_HINT_T0);
+                    }
+                }
+            }
+        }
+    }
 
     __m128 r = _mm_rcp_ps(_mm_max_ps(_mm_cvtepi32_ps(_mm_setr_epi32(yB - yT, yM - yT, yB - yM, 1)),
                                      _mm_set1_ps(1e-6f)));
