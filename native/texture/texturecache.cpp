@@ -211,20 +211,28 @@ const float kBlurWeights[5] = {0.053990968f, 0.24197072f, 0.3989423f, 0.24197072
 
 // Neighbour indices and weights of one pass for every position: a neighbour
 // outside 0..127 wraps or gets weight 0 (its index then points at the centre
-// so the load stays inside the image).
+// so the load stays inside the image). `wsum` is the sum of the weights used,
+// added in neighbour order; the vector forms are the same values in all lanes.
 struct blur_taps {
     int index[128][5];
     float weight[128][5];
     bool used[128][5];
+    __m128 vweight[128][5];
+    __m128 vwsum[128];
     explicit blur_taps(bool wrap) {
-        for (int x = 0; x < 128; ++x)
+        for (int x = 0; x < 128; ++x) {
+            float wsum = 0.0f;
             for (int k = 0; k < 5; ++k) {
                 int n = x + k - 2;
                 bool inside = n >= 0 && n < 128;
                 used[x][k] = inside || wrap;
                 index[x][k] = inside ? n : (wrap ? (n & 127) : x);
                 weight[x][k] = used[x][k] ? kBlurWeights[k] : 0.0f;
+                vweight[x][k] = _mm_set1_ps(weight[x][k]);
+                if (used[x][k]) wsum += weight[x][k];
             }
+            vwsum[x] = _mm_set1_ps(wsum);
+        }
     }
 };
 
@@ -233,9 +241,22 @@ const blur_taps& taps(bool wrap) {
     return wrap ? wrapped : clamped;
 }
 
-// Scalar reference of one pass over one line: `count` texels `srcStep` apart
-// into texels `dstStep` apart. KeepTransparent: word-0 texels stay 0 and are
-// not neighbours.
+inline __m128 texel_to_floats(unsigned int p) {
+    const __m128i zero = _mm_setzero_si128();
+    return _mm_cvtepi32_ps(_mm_unpacklo_epi16(_mm_unpacklo_epi8(_mm_cvtsi32_si128(int(p)), zero), zero));
+}
+
+inline unsigned int floats_to_texel(__m128 channels) {
+    __m128i q = _mm_cvttps_epi32(channels);
+    q = _mm_packs_epi32(q, q);
+    q = _mm_packus_epi16(q, q);
+    return (unsigned int)_mm_cvtsi128_si32(q);
+}
+
+// ---- scalar reference ----
+
+// One pass over one line: 128 texels `srcStep` apart into texels `dstStep`
+// apart. KeepTransparent: word-0 texels stay 0 and are not neighbours.
 template <bool KeepTransparent>
 void blur_line_scalar(const unsigned int* src, int srcStep, unsigned int* dst, int dstStep, const blur_taps& t) {
     for (int x = 0; x < 128; ++x) {
@@ -259,57 +280,114 @@ void blur_line_scalar(const unsigned int* src, int srcStep, unsigned int* dst, i
     }
 }
 
-// The same with the four channels of a texel in one vector. Left-out
-// neighbours contribute weight 0, which leaves both sums unchanged, so the
-// results equal the scalar ones bit for bit.
 template <bool KeepTransparent>
-void blur_line_sse(const unsigned int* src, int srcStep, unsigned int* dst, int dstStep, const blur_taps& t) {
-    const __m128i zero = _mm_setzero_si128();
-    for (int x = 0; x < 128; ++x) {
-        if (KeepTransparent && src[x * srcStep] == 0) {
-            dst[x * dstStep] = 0;
-            continue;
+void blur_scalar(const unsigned int* src, unsigned int* slot, const blur_taps& tu, const blur_taps& tv) {
+    alignas(16) static thread_local unsigned int work[128 * 128];
+    for (int v = 0; v < 128; ++v) blur_line_scalar<KeepTransparent>(src + v * 128, 1, work + v * 128, 1, tu);
+    for (int u = 0; u < 128; ++u)
+        blur_line_scalar<KeepTransparent>(work + u, 128, slot + u, texturecache::kStride, tv);
+}
+
+// ---- SSE ----
+//
+// The four channels of a texel are one vector; every product and sum is the
+// scalar one lane by lane, in the same order. A left-out neighbour contributes
+// weight 0, which leaves both sums unchanged, so results equal the scalar
+// reference bit for bit.
+
+// Opaque blur (every texel counts): the horizontal pass works on a row
+// converted to floats once, the vertical pass on whole rows of the work image
+// (kept as floats of the truncated values), so the inner loops have no table
+// look-ups per texel.
+void blur_sse_opaque(const unsigned int* src, unsigned int* slot, const blur_taps& tu, const blur_taps& tv) {
+    alignas(16) static thread_local __m128 work[128 * 128];
+    alignas(16) __m128 line[128];
+    for (int v = 0; v < 128; ++v) {
+        const unsigned int* row = src + v * 128;
+        for (int x = 0; x < 128; ++x) line[x] = texel_to_floats(row[x]);
+        __m128* out = work + v * 128;
+        for (int x = 0; x < 128; ++x) {
+            const int* ix = tu.index[x];
+            const __m128* w = tu.vweight[x];
+            __m128 sum = _mm_mul_ps(w[0], line[ix[0]]);
+            sum = _mm_add_ps(sum, _mm_mul_ps(w[1], line[ix[1]]));
+            sum = _mm_add_ps(sum, _mm_mul_ps(w[2], line[ix[2]]));
+            sum = _mm_add_ps(sum, _mm_mul_ps(w[3], line[ix[3]]));
+            sum = _mm_add_ps(sum, _mm_mul_ps(w[4], line[ix[4]]));
+            out[x] = _mm_cvtepi32_ps(_mm_cvttps_epi32(_mm_div_ps(sum, tu.vwsum[x])));
         }
-        __m128 sum = _mm_setzero_ps();
-        __m128 wsum = _mm_setzero_ps();
-        for (int k = 0; k < 5; ++k) {
-            unsigned int n = src[t.index[x][k] * srcStep];
-            __m128 w = _mm_set1_ps(t.weight[x][k]);
-            if (KeepTransparent) {
-                __m128i nz = _mm_cmpeq_epi32(_mm_cvtsi32_si128(int(n)), zero);
-                nz = _mm_shuffle_epi32(nz, 0);
-                w = _mm_andnot_ps(_mm_castsi128_ps(nz), w);
-            }
-            __m128i px = _mm_unpacklo_epi16(_mm_unpacklo_epi8(_mm_cvtsi32_si128(int(n)), zero), zero);
-            sum = _mm_add_ps(sum, _mm_mul_ps(w, _mm_cvtepi32_ps(px)));
-            wsum = _mm_add_ps(wsum, w);
+    }
+    for (int v = 0; v < 128; ++v) {
+        const int* iv = tv.index[v];
+        const __m128* r0 = work + iv[0] * 128;
+        const __m128* r1 = work + iv[1] * 128;
+        const __m128* r2 = work + iv[2] * 128;
+        const __m128* r3 = work + iv[3] * 128;
+        const __m128* r4 = work + iv[4] * 128;
+        const __m128 w0 = tv.vweight[v][0], w1 = tv.vweight[v][1], w2 = tv.vweight[v][2], w3 = tv.vweight[v][3],
+                     w4 = tv.vweight[v][4], ws = tv.vwsum[v];
+        unsigned int* out = slot + v * texturecache::kStride;
+        for (int x = 0; x < 128; ++x) {
+            __m128 sum = _mm_mul_ps(w0, r0[x]);
+            sum = _mm_add_ps(sum, _mm_mul_ps(w1, r1[x]));
+            sum = _mm_add_ps(sum, _mm_mul_ps(w2, r2[x]));
+            sum = _mm_add_ps(sum, _mm_mul_ps(w3, r3[x]));
+            sum = _mm_add_ps(sum, _mm_mul_ps(w4, r4[x]));
+            out[x] = floats_to_texel(_mm_div_ps(sum, ws));
         }
-        __m128i q = _mm_cvttps_epi32(_mm_div_ps(sum, wsum));
-        q = _mm_packs_epi32(q, q);
-        q = _mm_packus_epi16(q, q);
-        dst[x * dstStep] = (unsigned int)_mm_cvtsi128_si32(q);
     }
 }
 
-typedef void (*blur_line_fn)(const unsigned int*, int, unsigned int*, int, const blur_taps&);
+// Blur keeping transparent texels: a neighbour's weight is masked to 0 when
+// the neighbour is word 0, and transparent centres give 0.
+void blur_line_sse_transparent(const unsigned int* src, int srcStep, unsigned int* dst, int dstStep,
+                               const blur_taps& t) {
+    alignas(16) __m128 line[128];
+    alignas(16) __m128 opaque[128];
+    const __m128i zero = _mm_setzero_si128();
+    for (int x = 0; x < 128; ++x) {
+        unsigned int p = src[x * srcStep];
+        line[x] = texel_to_floats(p);
+        opaque[x] = _mm_castsi128_ps(_mm_xor_si128(_mm_cmpeq_epi32(_mm_set1_epi32(int(p)), zero),
+                                                   _mm_set1_epi32(-1)));
+    }
+    for (int x = 0; x < 128; ++x) {
+        if (src[x * srcStep] == 0) {
+            dst[x * dstStep] = 0;
+            continue;
+        }
+        const int* ix = t.index[x];
+        __m128 sum = _mm_setzero_ps();
+        __m128 wsum = _mm_setzero_ps();
+        for (int k = 0; k < 5; ++k) {
+            __m128 w = _mm_and_ps(t.vweight[x][k], opaque[ix[k]]);
+            sum = _mm_add_ps(sum, _mm_mul_ps(w, line[ix[k]]));
+            wsum = _mm_add_ps(wsum, w);
+        }
+        dst[x * dstStep] = floats_to_texel(_mm_div_ps(sum, wsum));
+    }
+}
 
-// Rows from the source into a work image, then columns from it into the slot.
-void blur(const unsigned int* src, unsigned int* slot, bool wrapu, bool wrapv, blur_line_fn line) {
+void blur_sse_transparent(const unsigned int* src, unsigned int* slot, const blur_taps& tu, const blur_taps& tv) {
     alignas(16) static thread_local unsigned int work[128 * 128];
-    const blur_taps& tu = taps(wrapu);
-    const blur_taps& tv = taps(wrapv);
-    for (int v = 0; v < 128; ++v) line(src + v * 128, 1, work + v * 128, 1, tu);
-    for (int u = 0; u < 128; ++u) line(work + u, 128, slot + u, texturecache::kStride, tv);
+    for (int v = 0; v < 128; ++v) blur_line_sse_transparent(src + v * 128, 1, work + v * 128, 1, tu);
+    for (int u = 0; u < 128; ++u) blur_line_sse_transparent(work + u, 128, slot + u, texturecache::kStride, tv);
 }
 
 }  // namespace
 
 void texturecache::copy_and_blur_texture(const unsigned int* src, unsigned int* slot, bool wrapu, bool wrapv,
                                          bool transparentTexelsBlur) {
-    blur(src, slot, wrapu, wrapv, transparentTexelsBlur ? blur_line_sse<false> : blur_line_sse<true>);
+    if (transparentTexelsBlur)
+        blur_sse_opaque(src, slot, taps(wrapu), taps(wrapv));
+    else
+        blur_sse_transparent(src, slot, taps(wrapu), taps(wrapv));
 }
 
 void texturecache::copy_and_blur_texture_scalar(const unsigned int* src, unsigned int* slot, bool wrapu, bool wrapv,
                                                 bool transparentTexelsBlur) {
-    blur(src, slot, wrapu, wrapv, transparentTexelsBlur ? blur_line_scalar<false> : blur_line_scalar<true>);
+    if (transparentTexelsBlur)
+        blur_scalar<false>(src, slot, taps(wrapu), taps(wrapv));
+    else
+        blur_scalar<true>(src, slot, taps(wrapu), taps(wrapv));
 }
