@@ -45,6 +45,10 @@ struct RasterTables_c {
     alignas(16) static constexpr unsigned int RightClippingMasks[2][4] = {{~0u, ~0u, ~0u, 0},
                                                                           {~0u, ~0u, 0, 0}};
     alignas(16) static constexpr float ZeroOneTwoThree[4] = {0.0f, 1.0f, 2.0f, 3.0f};
+    // ZeroOneTwoThree + float(-lead) for a first group starting `lead` pixels
+    // before the span (the same values, without a conversion per row).
+    alignas(16) static constexpr float LeadLanes[4][4] = {
+        {0.0f, 1.0f, 2.0f, 3.0f}, {-1.0f, 0.0f, 1.0f, 2.0f}, {-2.0f, -1.0f, 0.0f, 1.0f}, {-3.0f, -2.0f, -1.0f, 0.0f}};
     // Blend weights (I, J, I, J) of the triangle's vertices 0, 1, 2.
     alignas(16) static constexpr float IJ[3][4] = {
         {65535.0f, 0.0f, 65535.0f, 0.0f}, {0.0f, 65535.0f, 0.0f, 65535.0f}, {0.0f, 0.0f, 0.0f, 0.0f}};
@@ -368,7 +372,7 @@ struct RenderHalfTriangle_c : RasterTables_c {
             Group<false>(k, l, _mm_load_si128(reinterpret_cast<const __m128i*>(UnalignedMasks[1][n - 1])), cp, dp);
     }
 
-    static void RenderHalfTriangle(HalfTriangle_s& h) {
+    static RAST_INLINE void RenderHalfTriangle(HalfTriangle_s& h) {
         int row = h.m_Row;
         int count = h.m_RowCount;
         __m128 edges = h.m_Edges;
@@ -417,7 +421,6 @@ struct RenderHalfTriangle_c : RasterTables_c {
             if constexpr (Fog) fs = h.m_FogSteps;
             if constexpr (kWeights) ws = h.m_WeightSteps;
             if constexpr (kTex) ts = h.m_TexSteps;
-            const __m128 zott = _mm_load_ps(ZeroOneTwoThree);
             const __m128 four = _mm_set1_ps(4.0f);
             unsigned int* const cbuf = m_pColourBuffer;
             float* const dbuf = m_pDepthBuffer;
@@ -446,7 +449,7 @@ struct RenderHalfTriangle_c : RasterTables_c {
                     inv = _mm_shuffle_ps(inv, inv, 0);
                     const int s = xStart - xL;
                     const __m128 sf = _mm_set1_ps(float(s));
-                    const __m128 lanes = _mm_add_ps(zott, _mm_set1_ps(float(-lead)));
+                    const __m128 lanes = _mm_load_ps(LeadLanes[lead]);
                     if constexpr (DepthTest || kTex) {
                         __m128 zl = detail::Bcast<1>(edges);
                         __m128 dz = _mm_mul_ps(_mm_sub_ps(detail::Bcast<3>(edges), zl), inv);
@@ -527,6 +530,70 @@ RAST_INLINE void LoadVertex(const Triangle_s& t, int i, Vertex_s& v) {
 
 }  // namespace detail
 
+// Lower half: the long edge continues, the short side restarts at the middle
+// vertex (advanced by `carried` rows).
+template <ShadeMode_e Shade, bool TexTransform, FogMode_e Fog>
+RAST_INLINE void SetLowerHalf(HalfTriangle_s& h, bool longLeft, const detail::Vertex_s& M, const detail::Vertex_s& gD,
+                              int carried) {
+    using namespace detail;
+    constexpr bool kColour = Shade >= ShadeMode_Gouraud;
+    constexpr bool kFog = Fog != FogMode_None;
+    constexpr bool kTex = Shade >= ShadeMode_Textured;
+    constexpr bool kWeights = Shade == ShadeMode_TextureBlend;
+    const __m128 cf = _mm_set1_ps(float(carried));
+    Vertex_s s;
+    s.p = _mm_add_ps(M.p, _mm_mul_ps(gD.p, cf));
+    if constexpr (kColour) s.c = _mm_add_ps(M.c, _mm_mul_ps(gD.c, cf));
+    if constexpr (kFog) s.f = _mm_add_ps(M.f, _mm_mul_ps(gD.f, cf));
+    if constexpr (kTex) s.t = _mm_add_ps(M.t, _mm_mul_ps(gD.t, cf));
+    if constexpr (kWeights) s.w = _mm_add_ps(M.w, _mm_mul_ps(gD.w, cf));
+    if (longLeft) {
+        // short side is the right one: keep lanes 0,1 (float) / low half (16-bit)
+        h.m_Edges = _mm_shuffle_ps(h.m_Edges, s.p, _MM_SHUFFLE(2, 0, 1, 0));
+        h.m_EdgeSteps = _mm_shuffle_ps(h.m_EdgeSteps, gD.p, _MM_SHUFFLE(2, 0, 1, 0));
+        if constexpr (kColour) {
+            h.m_EdgeColours = _mm_unpacklo_epi64(h.m_EdgeColours, ToU16(s.c, s.c));
+            h.m_EdgeColourSteps = _mm_unpacklo_epi64(h.m_EdgeColourSteps, ToI16(gD.c, gD.c));
+        }
+        if constexpr (kFog) {
+            h.m_FogEdges = _mm_unpacklo_epi64(h.m_FogEdges, ToU16(s.f, s.f));
+            h.m_FogSteps = _mm_unpacklo_epi64(h.m_FogSteps, ToI16(gD.f, gD.f));
+        }
+        if constexpr (kTex) {
+            h.m_TexEdges = _mm_shuffle_ps(h.m_TexEdges, s.t, _MM_SHUFFLE(1, 0, 1, 0));
+            h.m_TexSteps = _mm_shuffle_ps(h.m_TexSteps, gD.t, _MM_SHUFFLE(1, 0, 1, 0));
+        }
+        if constexpr (kWeights) {
+            h.m_WeightEdges = _mm_unpacklo_epi64(h.m_WeightEdges, ToU16(s.w, s.w));
+            h.m_WeightSteps = _mm_unpacklo_epi64(h.m_WeightSteps, ToI16(gD.w, gD.w));
+        }
+    } else {
+        // short side is the left one: replace lanes 0,1 / the low half
+        auto low = [](__m128i keepHigh, __m128i newLow) {
+            return _mm_castpd_si128(_mm_move_sd(_mm_castsi128_pd(keepHigh), _mm_castsi128_pd(newLow)));
+        };
+        h.m_Edges = _mm_shuffle_ps(s.p, h.m_Edges, _MM_SHUFFLE(3, 2, 2, 0));
+        h.m_EdgeSteps = _mm_shuffle_ps(gD.p, h.m_EdgeSteps, _MM_SHUFFLE(3, 2, 2, 0));
+        if constexpr (kColour) {
+            h.m_EdgeColours = low(h.m_EdgeColours, ToU16(s.c, s.c));
+            h.m_EdgeColourSteps = low(h.m_EdgeColourSteps, ToI16(gD.c, gD.c));
+        }
+        if constexpr (kFog) {
+            h.m_FogEdges = low(h.m_FogEdges, ToU16(s.f, s.f));
+            h.m_FogSteps = low(h.m_FogSteps, ToI16(gD.f, gD.f));
+        }
+        if constexpr (kTex) {
+            h.m_TexEdges = _mm_shuffle_ps(s.t, h.m_TexEdges, _MM_SHUFFLE(3, 2, 1, 0));
+            h.m_TexSteps = _mm_shuffle_ps(gD.t, h.m_TexSteps, _MM_SHUFFLE(3, 2, 1, 0));
+        }
+        if constexpr (kWeights) {
+            h.m_WeightEdges = low(h.m_WeightEdges, ToU16(s.w, s.w));
+            h.m_WeightSteps = low(h.m_WeightSteps, ToI16(gD.w, gD.w));
+        }
+    }
+}
+
+
 template <ShadeMode_e Shade, TexAddressMode_e AddrU, TexAddressMode_e AddrV, bool TexTransform, FogMode_e Fog,
           BlendMode_e Blend, bool Transparent, bool MapMod, bool DepthWrite, bool ColourWrite, bool DepthTest>
 void RenderTriangle(const Triangle_s& t) {
@@ -587,11 +654,15 @@ void RenderTriangle(const Triangle_s& t) {
             xb = xb < clip.x1 - 1 ? xb : clip.x1 - 1;
             if (xb >= xa) {
                 const intptr_t pitch = m_ScreenPitch;
+                // the row's last pixel only when it lies in another cache line
+                const bool two = ((reinterpret_cast<uintptr_t>(m_pColourBuffer + xa) ^
+                                   reinterpret_cast<uintptr_t>(m_pColourBuffer + xb)) & ~uintptr_t(63)) != 0 ||
+                                 (pitch & 15) != 0;
                 for (int row = r0; row < r1; ++row) {
                     const intptr_t o = intptr_t(row) * pitch;
                     if constexpr (ColourWrite) {
                         _mm_prefetch(reinterpret_cast<const char*>(m_pColourBuffer + o + xa), _MM_HINT_T0);
-                        _mm_prefetch(reinterpret_cast<const char*>(m_pColourBuffer + o + xb), _MM_HINT_T0);
+                        if (two) _mm_prefetch(reinterpret_cast<const char*>(m_pColourBuffer + o + xb), _MM_HINT_T0);
                     }
                     if constexpr (DepthTest) {
                         _mm_prefetch(reinterpret_cast<const char*>(m_pDepthBuffer + o + xa), _MM_HINT_T0);
@@ -700,73 +771,21 @@ void RenderTriangle(const Triangle_s& t) {
             h.m_WeightSteps = ToI16(gl.w, gr.w);
         }
     }
-    int row = start;
-    int carried = 0;
-    if (count >= 1) {
-        Half::RenderHalfTriangle(h);
-        row = end;
-    } else {
-        carried = -count;
-    }
-
-    // lower half: the long edge continues, the short side restarts at the middle vertex
+    // One call site for both halves, so the span routine is inlined once.
+    const bool upper = count >= 1;
+    const int lowRow = upper ? end : start;
+    const int carried = upper ? 0 : -count;  // rows the lower half skips into its short edge
     const int end2 = yB < clip.y1 ? yB : clip.y1;
-    const int count2 = end2 - row;
-    if (count2 <= 0) return;
-    const __m128 cf = _mm_set1_ps(float(carried));
-    Vertex_s s;
-    s.p = _mm_add_ps(M.p, _mm_mul_ps(gD.p, cf));
-    if constexpr (kColour) s.c = _mm_add_ps(M.c, _mm_mul_ps(gD.c, cf));
-    if constexpr (kFog) s.f = _mm_add_ps(M.f, _mm_mul_ps(gD.f, cf));
-    if constexpr (kTex) s.t = _mm_add_ps(M.t, _mm_mul_ps(gD.t, cf));
-    if constexpr (kWeights) s.w = _mm_add_ps(M.w, _mm_mul_ps(gD.w, cf));
-    if (longLeft) {
-        // short side is the right one: keep lanes 0,1 (float) / low half (16-bit)
-        h.m_Edges = _mm_shuffle_ps(h.m_Edges, s.p, _MM_SHUFFLE(2, 0, 1, 0));
-        h.m_EdgeSteps = _mm_shuffle_ps(h.m_EdgeSteps, gD.p, _MM_SHUFFLE(2, 0, 1, 0));
-        if constexpr (kColour) {
-            h.m_EdgeColours = _mm_unpacklo_epi64(h.m_EdgeColours, ToU16(s.c, s.c));
-            h.m_EdgeColourSteps = _mm_unpacklo_epi64(h.m_EdgeColourSteps, ToI16(gD.c, gD.c));
+    const int count2 = end2 - lowRow;
+    for (int pass = upper ? 0 : 1; pass < 2; ++pass) {
+        if (pass == 1) {
+            if (count2 <= 0) return;
+            SetLowerHalf<Shade, TexTransform, Fog>(h, longLeft, M, gD, carried);
+            h.m_Row = lowRow;
+            h.m_RowCount = count2;
         }
-        if constexpr (kFog) {
-            h.m_FogEdges = _mm_unpacklo_epi64(h.m_FogEdges, ToU16(s.f, s.f));
-            h.m_FogSteps = _mm_unpacklo_epi64(h.m_FogSteps, ToI16(gD.f, gD.f));
-        }
-        if constexpr (kTex) {
-            h.m_TexEdges = _mm_shuffle_ps(h.m_TexEdges, s.t, _MM_SHUFFLE(1, 0, 1, 0));
-            h.m_TexSteps = _mm_shuffle_ps(h.m_TexSteps, gD.t, _MM_SHUFFLE(1, 0, 1, 0));
-        }
-        if constexpr (kWeights) {
-            h.m_WeightEdges = _mm_unpacklo_epi64(h.m_WeightEdges, ToU16(s.w, s.w));
-            h.m_WeightSteps = _mm_unpacklo_epi64(h.m_WeightSteps, ToI16(gD.w, gD.w));
-        }
-    } else {
-        // short side is the left one: replace lanes 0,1 / the low half
-        auto low = [](__m128i keepHigh, __m128i newLow) {
-            return _mm_castpd_si128(_mm_move_sd(_mm_castsi128_pd(keepHigh), _mm_castsi128_pd(newLow)));
-        };
-        h.m_Edges = _mm_shuffle_ps(s.p, h.m_Edges, _MM_SHUFFLE(3, 2, 2, 0));
-        h.m_EdgeSteps = _mm_shuffle_ps(gD.p, h.m_EdgeSteps, _MM_SHUFFLE(3, 2, 2, 0));
-        if constexpr (kColour) {
-            h.m_EdgeColours = low(h.m_EdgeColours, ToU16(s.c, s.c));
-            h.m_EdgeColourSteps = low(h.m_EdgeColourSteps, ToI16(gD.c, gD.c));
-        }
-        if constexpr (kFog) {
-            h.m_FogEdges = low(h.m_FogEdges, ToU16(s.f, s.f));
-            h.m_FogSteps = low(h.m_FogSteps, ToI16(gD.f, gD.f));
-        }
-        if constexpr (kTex) {
-            h.m_TexEdges = _mm_shuffle_ps(s.t, h.m_TexEdges, _MM_SHUFFLE(3, 2, 1, 0));
-            h.m_TexSteps = _mm_shuffle_ps(gD.t, h.m_TexSteps, _MM_SHUFFLE(3, 2, 1, 0));
-        }
-        if constexpr (kWeights) {
-            h.m_WeightEdges = low(h.m_WeightEdges, ToU16(s.w, s.w));
-            h.m_WeightSteps = low(h.m_WeightSteps, ToI16(gD.w, gD.w));
-        }
+        Half::RenderHalfTriangle(h);
     }
-    h.m_Row = row;
-    h.m_RowCount = count2;
-    Half::RenderHalfTriangle(h);
 }
 
 }  // namespace Rasterizer_n
