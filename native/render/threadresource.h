@@ -32,6 +32,16 @@ public:
     void linkthread() {}
     void unlinkthread() {}
 
+    // Point particles: positions (3 per particle, 12 fractional bits), ARGB
+    // colours, world sizes (x 1/2048) and texture ids (65535: none), `count`
+    // of each. Textured particles are scaled, depth-tested sprite blits of
+    // their texture; untextured ones are depth-tested discs. First: colour is
+    // written; Second: depth tested (the last two switches of the blit). May
+    // request textures from Java (no pinned arrays while it runs).
+    template <bool First, bool Second>
+    void render_particles(const int* positions, const int* colours, const int* sizes, const short* textures,
+                          int count);
+
     linkable m_Link;
     toolkit* m_Toolkit;
     int m_Second;
