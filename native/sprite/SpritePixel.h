@@ -1,8 +1,8 @@
 // Per-pixel arithmetic of the sprite blitters: the colour operations and blend
 // modes, once as plain integer code for one pixel and once in SSE2 16-bit
 // lanes for four pixels. Both give identical results; the blit loops use the
-// four-pixel form for the body of a row and the one-pixel form for its head
-// and tail.
+// four-pixel form for whole rows (the last 1-3 pixels of a row in a partly
+// filled vector), the one-pixel form is the plain reference.
 #pragma once
 
 #include <emmintrin.h>

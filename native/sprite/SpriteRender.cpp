@@ -2,8 +2,9 @@
 // parallelogram drawing into the toolkit's current colour buffer. Each is a
 // template over colour operation and blend mode; a row is drawn by one loop
 // (four pixels per SSE2 step with unaligned 16-byte loads and stores, then the
-// 0-3 remaining pixels one by one) parameterised by how source pixels are
-// fetched.
+// 0-3 remaining pixels through the same four-pixel arithmetic) parameterised
+// by how source pixels are fetched. The plain one-pixel form of the arithmetic
+// (SpritePixel.h) is the reference the tests hold both against.
 #include <emmintrin.h>
 
 #include <cmath>
@@ -168,12 +169,6 @@ inline void narrow_fixed(long long c, long long d, long long limit, long long& l
 template <int Op, int Blend, bool DepthTest, class Fetch>
 inline void DrawRow(uint32_t* dst, const float* z, float depth, int n, const Fetch& f, const Consts_s& k) {
     int i = 0;
-    auto one = [&](int j) {
-        uint32_t s;
-        if (!f.get1(j, s)) return;
-        if (DepthTest && !(depth <= z[j])) return;
-        dst[j] = Pixel1<Op, Blend>(s, dst[j], k);
-    };
     const __m128 depth4 = _mm_set1_ps(depth);
     for (; i + 4 <= n; i += 4) {
         __m128i valid = _mm_set1_epi32(-1);
@@ -188,7 +183,22 @@ inline void DrawRow(uint32_t* dst, const float* z, float depth, int n, const Fet
         }
         _mm_storeu_si128(p, r);
     }
-    for (; i < n; ++i) one(i);
+    if (i < n) {
+        // the 1-3 remaining pixels through the same four-pixel arithmetic,
+        // reading and writing only those pixels
+        alignas(16) uint32_t sb[4] = {0, 0, 0, 0}, db[4] = {0, 0, 0, 0}, rb[4];
+        bool take[4] = {false, false, false, false};
+        const int rem = n - i;
+        for (int j = 0; j < rem; ++j) {
+            take[j] = f.get1(i + j, sb[j]) && (!DepthTest || depth <= z[i + j]);
+            db[j] = dst[i + j];
+        }
+        _mm_store_si128(reinterpret_cast<__m128i*>(rb),
+                        Pixel4<Op, Blend>(_mm_load_si128(reinterpret_cast<const __m128i*>(sb)),
+                                          _mm_load_si128(reinterpret_cast<const __m128i*>(db)), k));
+        for (int j = 0; j < rem; ++j)
+            if (take[j]) dst[i + j] = rb[j];
+    }
 }
 
 // ---- axis-aligned ------------------------------------------------------------
