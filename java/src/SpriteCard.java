@@ -8,8 +8,8 @@ import javax.imageio.ImageIO;
  * A sprite test card: one sprite drawn with every colour operation (rows:
  * modulate, none, tint, add, subtract) in every blend mode (columns: replace,
  * alpha, add), then scaled, tiled, rotated and sheared as parallelograms, and
- * confined by a clipping mask. Drawn into an offscreen sprite and written as a
- * PNG.
+ * confined by a clipping mask, and a particle fountain. Drawn into an offscreen
+ * sprite and written as a PNG.
  */
 public final class SpriteCard {
     private SpriteCard() {}
@@ -83,12 +83,63 @@ public final class SpriteCard {
             ball.M(ball.nativeid);
             bars.M(bars.nativeid);
         }
+        fountain(tk, w, h);
+    }
+
+    /** A soft round particle texture (128 x 128). */
+    static int[] sparkTexture() {
+        int[] px = new int[128 * 128];
+        for (int y = 0; y < 128; ++y)
+            for (int x = 0; x < 128; ++x) {
+                double d = Math.hypot(x - 63.5, y - 63.5) / 64;
+                int a = d >= 1 ? 0 : (int) (255 * Math.min(1, 1.6 * (1 - d)));
+                px[y * 128 + x] = a << 24 | 0xFFE0A0;
+            }
+        return px;
+    }
+
+    /**
+     * A particle fountain in the lower left: textured sparks (texture 1, when the
+     * toolkit has a texture cache that can get it) and plain discs, along arcs,
+     * depth-tested against a cleared depth buffer.
+     */
+    static void fountain(ja tk, int w, int h) {
+        // world (x, y, z) lands on pixel (x, y) at depth z / 2 + 1/2; right axis +x
+        tk.GA(0f, 1f);
+        tk.wa(new float[] {2f / w, 0, 0, 0, 0, 2f / h, 0, 0, 0, 0, 1, 0, -1, -1, 0, 1});
+        tk.AA(new float[] {1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1});
+        tk.ba(2, 0);
+        int n = 120;
+        int[] pos = new int[3 * n], colours = new int[n], sizes = new int[n];
+        short[] textures = new short[n];
+        java.util.Random rng = new java.util.Random(7);
+        for (int i = 0; i < n; ++i) {
+            double t = rng.nextDouble(), vx = (rng.nextDouble() - 0.5) * 70, vy = -190 - rng.nextDouble() * 50;
+            double x = 45 + vx * t, y = 232 + vy * t + 200 * t * t;
+            pos[3 * i] = (int) (x * 4096);
+            pos[3 * i + 1] = (int) (y * 4096);
+            pos[3 * i + 2] = 0;
+            colours[i] = (int) (255 * (1 - t * 0.7)) << 24 | (i % 2 == 0 ? 0xFFFFFF : 0x60C0FF);
+            sizes[i] = (int) ((i % 2 == 0 ? 16 - 8 * t : 7 - 4 * t) * 2048);
+            textures[i] = (short) (i % 2 == 0 ? 1 : -1);
+        }
+        a tr = new a();
+        tr.ha(0, 0, 0, 0, 0);
+        try {
+            tr.b(tr.nativeid, 0, pos, colours, sizes, textures, n);
+        } finally {
+            tr.R(tr.nativeid);
+        }
     }
 
     /** Writes the card at 320 x 240 to the file named by the first argument (default out/sprites.png). */
     public static void main(String[] args) throws IOException {
         Pavoqen.loadLibrary();
-        ja tk = Pavoqen.createToolkit(null, 0);
+        ja tk = Pavoqen.createToolkit((t, id) -> {
+            if (id != 1) return false;
+            t.F(id, sparkTexture(), 0, 2, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0);
+            return true;
+        }, 16);
         try {
             File png = new File(args.length > 0 ? args[0] : "out/sprites.png");
             renderPng(tk, 320, 240, png);
