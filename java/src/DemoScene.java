@@ -22,6 +22,7 @@ final class DemoScene {
         add(new DemoPanel2D());
         add(new DemoTriangles());
         add(new DemoSprites());
+        add(new DemoParticles());
         add(new DemoText());
     }
 

@@ -40,6 +40,7 @@ final class DemoSprites implements DemoLayer {
 
     @Override public void draw(DemoFrame f) {
         DemoLayout l = f.layout;
+        blendGrid(f);
         int cx = l.cellX[3], cy = l.cellY[3], r = l.cellRadius;
         for (int i = 0; i < 8; i++) {
             double a = f.t + i * Math.PI / 4;
@@ -56,5 +57,21 @@ final class DemoSprites implements DemoLayer {
         float ox = l.cellX[2], oy = l.cellY[2];
         checker.e(checker.nativeid, ox - hx + hy, oy - hy - hx, ox + hx + hy, oy + hy - hx, ox - hx - hy, oy - hy + hx,
                   2, 0xA040FF40, 1);
+    }
+
+    /**
+     * Small orbs right of the title: one row per blend mode (replace, alpha,
+     * add), one column per colour operation (modulate, none, tint, add,
+     * subtract), with a colour that cycles.
+     */
+    private void blendGrid(DemoFrame f) {
+        DemoLayout l = f.layout;
+        int step = 15, size = 14;
+        int x0 = l.cellsRight - 5 * step - 8, y0 = l.rampBottom + 1;
+        if (x0 < 230) return;  // no room beside the title
+        int c = 0x80000000 | DemoFrame.rgb((int) (128 + 127 * Math.sin(f.t)), 160, (int) (128 + 127 * Math.cos(f.t))) & 0xFFFFFF;
+        for (int blend = 0; blend < 3; blend++)
+            for (int op = 0; op < 5; op++)
+                orb.ha(orb.nativeid, x0 + op * step, y0 + blend * step, size, size, op, c, blend);
     }
 }

@@ -7,11 +7,16 @@ final class DemoTextures {
     /** Number of texture ids the demo's cache keeps metrics for. */
     static final int IDS = 64;
 
+    /** Id of the soft round spark texture used by the particle fountain. */
+    static final int SPARK = 63;
+
     /** Uploads the requested texture during the request and reports success. */
     static final ja.TextureSource SOURCE = (tk, id) -> {
-        upload(tk, id);
+        if (id == SPARK) tk.F(id, SpriteCard.sparkTexture(), 0, 2, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0);
+        else upload(tk, id);
         return true;
     };
+
 
     private DemoTextures() {}
 
