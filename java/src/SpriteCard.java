@@ -1,8 +1,6 @@
-import java.awt.image.BufferedImage;
 import java.io.File;
 import java.io.IOException;
 
-import javax.imageio.ImageIO;
 
 /**
  * A sprite test card: one sprite drawn with every colour operation (rows:
@@ -151,27 +149,6 @@ public final class SpriteCard {
 
     /** Renders the card offscreen at width x height and writes it to {@code png}. */
     public static void renderPng(ja tk, int width, int height, File png) throws IOException {
-        ba pool = new ba();
-        pool.sa(0, 1 << 16);
-        fa target = new fa();
-        oa depth = new oa();
-        try {
-            target.UA(0, width, height);
-            depth.g(width, height);
-            tk.d(target.nativeid, depth.nativeid);
-            draw(tk, pool, width, height);
-            int[] pixels = tk.E(0, 0, width, height);
-            tk.d(0, 0);
-            BufferedImage img = new BufferedImage(width, height, BufferedImage.TYPE_INT_RGB);
-            img.setRGB(0, 0, width, height, pixels, 0, width);
-            File dir = png.getAbsoluteFile().getParentFile();
-            if (dir != null) dir.mkdirs();
-            ImageIO.write(img, "png", png);
-        } finally {
-            tk.d(0, 0);
-            if (target.nativeid != 0) target.M(target.nativeid);
-            if (depth.nativeid != 0) depth.za(depth.nativeid);
-            pool.ma();
-        }
+        OffscreenPng.render(tk, width, height, 1 << 16, png, SpriteCard::draw);
     }
 }

@@ -1,8 +1,6 @@
-import java.awt.image.BufferedImage;
 import java.io.File;
 import java.io.IOException;
 
-import javax.imageio.ImageIO;
 
 /**
  * A 2D test card: rectangles in the three modes (replace, blend, add), lines,
@@ -124,27 +122,6 @@ public final class TestCard2D {
 
     /** Renders the card offscreen at width x height and writes it to {@code png}. */
     public static void renderPng(ja tk, int width, int height, File png) throws IOException {
-        ba pool = new ba();
-        pool.sa(0, 1 << 20);
-        fa sprite = new fa();
-        oa depth = new oa();
-        try {
-            sprite.UA(0, width, height);
-            depth.g(width, height);
-            tk.d(sprite.nativeid, depth.nativeid);
-            draw(tk, pool, width, height);
-            int[] pixels = tk.E(0, 0, width, height);
-            tk.d(0, 0);
-            BufferedImage img = new BufferedImage(width, height, BufferedImage.TYPE_INT_RGB);
-            img.setRGB(0, 0, width, height, pixels, 0, width);
-            File dir = png.getAbsoluteFile().getParentFile();
-            if (dir != null) dir.mkdirs();
-            ImageIO.write(img, "png", png);
-        } finally {
-            tk.d(0, 0);
-            if (sprite.nativeid != 0) sprite.M(sprite.nativeid);
-            if (depth.nativeid != 0) depth.za(depth.nativeid);
-            pool.ma();
-        }
+        OffscreenPng.render(tk, width, height, 1 << 20, png, TestCard2D::draw);
     }
 }

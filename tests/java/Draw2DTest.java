@@ -13,10 +13,9 @@ import org.junit.jupiter.api.Test;
 class Draw2DTest {
     static final int W = 40, H = 30;
 
+    OffscreenTarget target;
     ja tk;
     ba pool;
-    fa sprite;
-    oa depth;
 
     @BeforeAll
     static void load() {
@@ -25,25 +24,14 @@ class Draw2DTest {
 
     @BeforeEach
     void target() {
-        tk = new ja();
-        tk.q(null, 0);
-        pool = new ba();
-        pool.sa(0, 1 << 20);
-        sprite = new fa();
-        sprite.UA(0, W, H);
-        depth = new oa();
-        depth.g(W, H);
-        tk.d(sprite.nativeid, depth.nativeid);
-        tk.ba(3, 0);
+        target = new OffscreenTarget(W, H);
+        tk = target.tk;
+        pool = target.pool;
     }
 
     @AfterEach
     void release() {
-        tk.d(0, 0);
-        sprite.M(sprite.nativeid);
-        depth.za(depth.nativeid);
-        pool.ma();
-        tk.ma();
+        target.close();
     }
 
     int[] pixels() {

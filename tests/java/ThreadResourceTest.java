@@ -12,10 +12,9 @@ import org.junit.jupiter.api.Test;
 class ThreadResourceTest {
     static final int W = 48, H = 32;
 
+    OffscreenTarget target;
     ja tk;
     ba pool;
-    fa sprite;
-    oa depth;
     a tr;
 
     @BeforeAll
@@ -25,16 +24,9 @@ class ThreadResourceTest {
 
     @BeforeEach
     void target() {
-        tk = new ja();
-        tk.q(null, 0);
-        pool = new ba();
-        pool.sa(0, 1 << 20);
-        sprite = new fa();
-        sprite.UA(0, W, H);
-        depth = new oa();
-        depth.g(W, H);
-        tk.d(sprite.nativeid, depth.nativeid);
-        tk.ba(3, 0);
+        target = new OffscreenTarget(W, H);
+        tk = target.tk;
+        pool = target.pool;
         tr = new a();
         tr.ha(0, 0, 0, 1, 2);
     }
@@ -42,11 +34,7 @@ class ThreadResourceTest {
     @AfterEach
     void release() {
         if (tr.nativeid != 0) tr.R(tr.nativeid);
-        tk.d(0, 0);
-        sprite.M(sprite.nativeid);
-        depth.za(depth.nativeid);
-        pool.ma();
-        tk.ma();
+        target.close();
     }
 
     int[] pixels() {
@@ -99,7 +87,7 @@ class ThreadResourceTest {
         tk.d(0, 0);
         tr.ra(tr.nativeid, 0, 0, W, 0, 0, H, -1, -1, -1);
         tr.K(tr.nativeid, 0, 0, 0, W, H, -1, 10, 0);
-        tk.d(sprite.nativeid, depth.nativeid);
+        tk.d(target.sprite.nativeid, target.depth.nativeid);
         for (int v : pixels()) assertEquals(0, v);
     }
 
