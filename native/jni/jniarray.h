@@ -35,42 +35,66 @@ PAVOQEN_ARRAY_TRAITS(unsigned char, jbooleanArray, Boolean)
 PAVOQEN_ARRAY_TRAITS(float, jfloatArray, Float)
 #undef PAVOQEN_ARRAY_TRAITS
 
-// Shared checks: a null array where elements are needed throws
+// What copied and pinned arrays share: the Java array, its length, the element
+// pointer and the checks. A null array where elements are needed throws
 // NullPointerException; one shorter than needed throws
 // ArrayIndexOutOfBoundsException(first missing index, length).
-template <class Derived>
-struct jniarray_checks {
+template <class T, class A>
+struct jniarray_base {
+    jniarray_base(JNIEnv* e, A a) : env(e), iscopy(JNI_FALSE), array(a), elements(nullptr), length(0) {}
+
     void need(long long n) const {
-        const Derived& d = static_cast<const Derived&>(*this);
         if (n <= 0) return;
-        if (!d.array) throw new NullPointerException();
-        if (n > d.length) throw new ArrayIndexOutOfBoundsException(int(n > 0x7fffffff ? 0x7fffffff : n - 1), d.length);
+        if (!array) throw new NullPointerException();
+        if (n > length) throw new ArrayIndexOutOfBoundsException(int(n > 0x7fffffff ? 0x7fffffff : n - 1), length);
     }
     void need_range(long long offset, long long n) const {
-        const Derived& d = static_cast<const Derived&>(*this);
         if (n <= 0) return;
-        if (!d.array) throw new NullPointerException();
-        check_range(offset, n, d.length);
+        if (!array) throw new NullPointerException();
+        check_range(offset, n, length);
     }
+    T& operator[](long long i) { return elements[i]; }
+    const T& operator[](long long i) const { return elements[i]; }
+    T* data() const { return elements; }
+    bool isnull() const { return array == nullptr; }
+
+    // The JVM failed to give the elements and raised OutOfMemoryError: replace
+    // it by ours so that no JNI call is made with an exception pending.
+    [[noreturn]] void elements_failed() {
+        array = nullptr;
+        length = 0;
+        if (env->ExceptionCheck()) env->ExceptionClear();
+        throw new OutOfMemory("array elements");
+    }
+
+    JNIEnv* env;
+    jboolean iscopy;
+    A array;
+    T* elements;
+    jsize length;
+
+    jniarray_base(const jniarray_base&) = delete;
+    jniarray_base& operator=(const jniarray_base&) = delete;
 };
 
 std::atomic<int>& pin_count_ref();
 
 template <class T, class A, bool ReadOnly>
-class copiedjniarray : public jniarray_checks<copiedjniarray<T, A, ReadOnly>> {
+class copiedjniarray : public jniarray_base<T, A> {
+    using base = jniarray_base<T, A>;
+
 public:
-    copiedjniarray(JNIEnv* e, A a) : env(e), iscopy(JNI_FALSE), array(a), elements(nullptr), length(0) {
+    using base::array;
+    using base::elements;
+    using base::env;
+    using base::iscopy;
+    using base::length;
+
+    copiedjniarray(JNIEnv* e, A a) : base(e, a) {
         if (array) {
             length = env->GetArrayLength(array);
             getElements();
-            if (!elements) {
-                // The JNI has raised OutOfMemoryError; replace it by ours so that
-                // no JNI call is made with an exception pending.
-                array = nullptr;
-                length = 0;
-                if (env->ExceptionCheck()) env->ExceptionClear();
-                throw new OutOfMemory("array elements");
-            }
+            if (!elements) this->elements_failed();
         }
     }
     ~copiedjniarray() {
@@ -82,19 +106,6 @@ public:
         array = nullptr;
         elements = nullptr;
     }
-    T& operator[](long long i) { return elements[i]; }
-    const T& operator[](long long i) const { return elements[i]; }
-    T* data() const { return elements; }
-    bool isnull() const { return array == nullptr; }
-
-    JNIEnv* env;
-    jboolean iscopy;
-    A array;
-    T* elements;
-    jsize length;
-
-    copiedjniarray(const copiedjniarray&) = delete;
-    copiedjniarray& operator=(const copiedjniarray&) = delete;
 };
 
 typedef copiedjniarray<int, jintArray, true> copied_jintArrayRO;
@@ -113,23 +124,26 @@ struct defer_pin_t {};
 constexpr defer_pin_t defer_pin{};
 
 template <class T, class A, bool ReadOnly>
-class pinnedjniarray : public jniarray_checks<pinnedjniarray<T, A, ReadOnly>> {
+class pinnedjniarray : public jniarray_base<T, A> {
+    using base = jniarray_base<T, A>;
+
 public:
+    using base::array;
+    using base::elements;
+    using base::env;
+    using base::iscopy;
+    using base::length;
+
     pinnedjniarray(JNIEnv* e, A a) : pinnedjniarray(e, a, defer_pin) { pin(); }
     // Reads the length only; elements stay null until pin().
-    pinnedjniarray(JNIEnv* e, A a, defer_pin_t) : env(e), iscopy(JNI_FALSE), array(a), elements(nullptr), length(0) {
+    pinnedjniarray(JNIEnv* e, A a, defer_pin_t) : base(e, a) {
         if (array) length = env->GetArrayLength(array);
     }
     // Pins the array (nothing for a null array or one already pinned).
     void pin() {
         if (!array || elements) return;
         elements = static_cast<T*>(env->GetPrimitiveArrayCritical(array, &iscopy));
-        if (!elements) {
-            array = nullptr;
-            length = 0;
-            if (env->ExceptionCheck()) env->ExceptionClear();
-            throw new OutOfMemory("array elements");
-        }
+        if (!elements) this->elements_failed();
         ++pin_count_ref();
     }
     ~pinnedjniarray() {
@@ -140,19 +154,6 @@ public:
             elements = nullptr;
         }
     }
-    T& operator[](long long i) { return elements[i]; }
-    const T& operator[](long long i) const { return elements[i]; }
-    T* data() const { return elements; }
-    bool isnull() const { return array == nullptr; }
-
-    JNIEnv* env;
-    jboolean iscopy;
-    A array;
-    T* elements;
-    jsize length;
-
-    pinnedjniarray(const pinnedjniarray&) = delete;
-    pinnedjniarray& operator=(const pinnedjniarray&) = delete;
 };
 
 // Pins deferred arrays in argument order.
