@@ -496,6 +496,32 @@ struct Vertex_s {
     __m128 p, c, f, t, w;
 };
 
+// Attribute-wise arithmetic over the attributes a mode carries besides the
+// position: colour (Gouraud and up), fog term, texture coordinates, blend
+// weights.
+template <ShadeMode_e Shade, FogMode_e Fog, class Op>
+RAST_INLINE Vertex_s VertexOp(const Vertex_s& a, const Vertex_s& b, Op op) {
+    Vertex_s r;
+    r.p = op(a.p, b.p);
+    if constexpr (Shade >= ShadeMode_Gouraud) r.c = op(a.c, b.c);
+    if constexpr (Fog != FogMode_None) r.f = op(a.f, b.f);
+    if constexpr (Shade >= ShadeMode_Textured) r.t = op(a.t, b.t);
+    if constexpr (Shade == ShadeMode_TextureBlend) r.w = op(a.w, b.w);
+    return r;
+}
+
+// Per-row gradient from vertex a to vertex b: (b - a) * r.
+template <ShadeMode_e Shade, FogMode_e Fog>
+RAST_INLINE Vertex_s Gradient(const Vertex_s& a, const Vertex_s& b, __m128 r) {
+    return VertexOp<Shade, Fog>(b, a, [r](__m128 x, __m128 y) { return _mm_mul_ps(_mm_sub_ps(x, y), r); });
+}
+
+// a advanced by n rows of gradient g: a + g * n.
+template <ShadeMode_e Shade, FogMode_e Fog>
+RAST_INLINE Vertex_s Advance(const Vertex_s& a, const Vertex_s& g, __m128 n) {
+    return VertexOp<Shade, Fog>(a, g, [n](__m128 x, __m128 y) { return _mm_add_ps(x, _mm_mul_ps(y, n)); });
+}
+
 template <ShadeMode_e Shade, bool TexTransform, FogMode_e Fog>
 RAST_INLINE void LoadVertex(const Triangle_s& t, int i, Vertex_s& v) {
     v.p = t.m_Positions[i];
@@ -541,12 +567,7 @@ RAST_INLINE void SetLowerHalf(HalfTriangle_s& h, bool longLeft, const detail::Ve
     constexpr bool kTex = Shade >= ShadeMode_Textured;
     constexpr bool kWeights = Shade == ShadeMode_TextureBlend;
     const __m128 cf = _mm_set1_ps(float(carried));
-    Vertex_s s;
-    s.p = _mm_add_ps(M.p, _mm_mul_ps(gD.p, cf));
-    if constexpr (kColour) s.c = _mm_add_ps(M.c, _mm_mul_ps(gD.c, cf));
-    if constexpr (kFog) s.f = _mm_add_ps(M.f, _mm_mul_ps(gD.f, cf));
-    if constexpr (kTex) s.t = _mm_add_ps(M.t, _mm_mul_ps(gD.t, cf));
-    if constexpr (kWeights) s.w = _mm_add_ps(M.w, _mm_mul_ps(gD.w, cf));
+    const Vertex_s s = Advance<Shade, Fog>(M, gD, cf);
     if (longLeft) {
         // short side is the right one: keep lanes 0,1 (float) / low half (16-bit)
         h.m_Edges = _mm_shuffle_ps(h.m_Edges, s.p, _MM_SHUFFLE(2, 0, 1, 0));
@@ -683,30 +704,9 @@ void RenderTriangle(const Triangle_s& t) {
     LoadVertex<Shade, TexTransform, Fog>(t, iB, B);
 
     // gradients: long edge (top-bottom), upper short (top-middle), lower short (middle-bottom)
-    Vertex_s gL, gU, gD;
-    gL.p = _mm_mul_ps(_mm_sub_ps(B.p, T.p), rL);
-    gU.p = _mm_mul_ps(_mm_sub_ps(M.p, T.p), rU);
-    gD.p = _mm_mul_ps(_mm_sub_ps(B.p, M.p), rD);
-    if constexpr (kColour) {
-        gL.c = _mm_mul_ps(_mm_sub_ps(B.c, T.c), rL);
-        gU.c = _mm_mul_ps(_mm_sub_ps(M.c, T.c), rU);
-        gD.c = _mm_mul_ps(_mm_sub_ps(B.c, M.c), rD);
-    }
-    if constexpr (kFog) {
-        gL.f = _mm_mul_ps(_mm_sub_ps(B.f, T.f), rL);
-        gU.f = _mm_mul_ps(_mm_sub_ps(M.f, T.f), rU);
-        gD.f = _mm_mul_ps(_mm_sub_ps(B.f, M.f), rD);
-    }
-    if constexpr (kTex) {
-        gL.t = _mm_mul_ps(_mm_sub_ps(B.t, T.t), rL);
-        gU.t = _mm_mul_ps(_mm_sub_ps(M.t, T.t), rU);
-        gD.t = _mm_mul_ps(_mm_sub_ps(B.t, M.t), rD);
-    }
-    if constexpr (kWeights) {
-        gL.w = _mm_mul_ps(_mm_sub_ps(B.w, T.w), rL);
-        gU.w = _mm_mul_ps(_mm_sub_ps(M.w, T.w), rU);
-        gD.w = _mm_mul_ps(_mm_sub_ps(B.w, M.w), rD);
-    }
+    const Vertex_s gL = Gradient<Shade, Fog>(T, B, rL);
+    const Vertex_s gU = Gradient<Shade, Fog>(T, M, rU);
+    const Vertex_s gD = Gradient<Shade, Fog>(M, B, rD);
     const bool longLeft = _mm_comigt_ss(gU.p, gL.p) != 0;
 
     // upper half, clipped to the viewport rows
@@ -729,25 +729,9 @@ void RenderTriangle(const Triangle_s& t) {
     if constexpr (TexTransform) h.m_TexOffset = t.m_TexOffset;
     if constexpr (MapMod) h.m_MapShift = t.m_MapShift;
     {
-        Vertex_s sL, sU;  // long and short edge on the start row
-        sL.p = _mm_add_ps(T.p, _mm_mul_ps(gL.p, skip));
-        sU.p = _mm_add_ps(T.p, _mm_mul_ps(gU.p, skip));
-        if constexpr (kColour) {
-            sL.c = _mm_add_ps(T.c, _mm_mul_ps(gL.c, skip));
-            sU.c = _mm_add_ps(T.c, _mm_mul_ps(gU.c, skip));
-        }
-        if constexpr (kFog) {
-            sL.f = _mm_add_ps(T.f, _mm_mul_ps(gL.f, skip));
-            sU.f = _mm_add_ps(T.f, _mm_mul_ps(gU.f, skip));
-        }
-        if constexpr (kTex) {
-            sL.t = _mm_add_ps(T.t, _mm_mul_ps(gL.t, skip));
-            sU.t = _mm_add_ps(T.t, _mm_mul_ps(gU.t, skip));
-        }
-        if constexpr (kWeights) {
-            sL.w = _mm_add_ps(T.w, _mm_mul_ps(gL.w, skip));
-            sU.w = _mm_add_ps(T.w, _mm_mul_ps(gU.w, skip));
-        }
+        // long and short edge on the start row
+        const Vertex_s sL = Advance<Shade, Fog>(T, gL, skip);
+        const Vertex_s sU = Advance<Shade, Fog>(T, gU, skip);
         const Vertex_s& l = longLeft ? sL : sU;
         const Vertex_s& rr = longLeft ? sU : sL;
         const Vertex_s& gl = longLeft ? gL : gU;

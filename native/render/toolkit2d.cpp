@@ -109,6 +109,30 @@ struct with_mask {
     }
 };
 
+// Steps along the major axis a (x when XMajor, else y) from a1 to a1 + da,
+// with the minor coordinate b in 16.16 fixed point, rounded from the middle
+// of the start pixel. Only the part of the run inside the clip box is walked.
+template <bool XMajor, class M, class Mask>
+void line_axis(toolkit& tk, const clip_box& c, i64 a1, i64 b1, i64 da, i64 db, const M& m, const Mask& mask) {
+    const i64 aLo = XMajor ? c.L : c.T, aHi = XMajor ? c.R : c.B;
+    const i64 bLo = XMajor ? c.T : c.L, bHi = XMajor ? c.B : c.R;
+    const i64 step = da > 0 ? slope16(db, da) : 0;
+    i64 fb = b1 * 65536 + 32768;
+    i64 as = a1, ae = min64(a1 + da, aHi - 1);
+    if (as < aLo) {
+        fb += step * (aLo - as);
+        as = aLo;
+    }
+    for (i64 a = as; a <= ae; ++a, fb += step) {
+        const i64 b = fb >> 16;
+        const i64 x = XMajor ? a : b, y = XMajor ? b : a;
+        if (b >= bLo && b < bHi && mask.pixel_ok(x, y)) {
+            uint32_t* p = tk.m_ColourBuffer + y * tk.m_Width + x;
+            *p = m(*p);
+        }
+    }
+}
+
 // General line, steps after the horizontal/vertical shortcut: end points
 // ordered so that dx + dy >= 0, then stepped along the major axis with the
 // minor coordinate in 16.16 fixed point. A zero-length line is a one-row
@@ -121,39 +145,10 @@ void line_steps(toolkit& tk, const clip_box& c, i64 x1, i64 y1, i64 dx, i64 dy, 
         dx = -dx;
         dy = -dy;
     }
-    const i64 W = tk.m_Width;
-    uint32_t* buf = tk.m_ColourBuffer;
-    if (dx > dy) {
-        const i64 step = slope16(dy, dx);
-        i64 fy = y1 * 65536 + 32768;
-        i64 xs = x1, xe = min64(x1 + dx, c.R - 1);
-        if (xs < c.L) {
-            fy += step * (c.L - xs);
-            xs = c.L;
-        }
-        for (i64 x = xs; x <= xe; ++x, fy += step) {
-            const i64 y = fy >> 16;
-            if (y >= c.T && y < c.B && mask.pixel_ok(x, y)) {
-                uint32_t* p = buf + y * W + x;
-                *p = m(*p);
-            }
-        }
-    } else {
-        const i64 step = dy > 0 ? slope16(dx, dy) : 0;
-        i64 fx = x1 * 65536 + 32768;
-        i64 ys = y1, ye = min64(y1 + dy, c.B - 1);
-        if (ys < c.T) {
-            fx += step * (c.T - ys);
-            ys = c.T;
-        }
-        for (i64 y = ys; y <= ye; ++y, fx += step) {
-            const i64 x = fx >> 16;
-            if (x >= c.L && x < c.R && mask.pixel_ok(x, y)) {
-                uint32_t* p = buf + y * W + x;
-                *p = m(*p);
-            }
-        }
-    }
+    if (dx > dy)
+        line_axis<true>(tk, c, x1, y1, dx, dy, m, mask);
+    else
+        line_axis<false>(tk, c, y1, x1, dy, dx, m, mask);
 }
 
 // Smallest k' in [k, cap] with !pred(k'), for a predicate that is true up to
