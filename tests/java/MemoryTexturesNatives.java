@@ -10,10 +10,8 @@ final class MemoryTexturesNatives {
     static native long allocate(ba pool, int size);
     /** True when the holder still sees its pattern at its block's current address. */
     static native boolean intact(long holder);
-    static native int length(long holder);
     static native void release(long holder);
     static native int capacity(ba pool);
-    static native int blockCount(ba pool);
     /** Native address of the toolkit's pool, and of a pool peer's pool. */
     static native long toolkitPool(long toolkit);
     static native long poolAddress(ba pool);

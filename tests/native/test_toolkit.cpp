@@ -4,6 +4,7 @@
 
 #include <xmmintrin.h>
 
+#include <algorithm>
 #include <cmath>
 #include <cstring>
 #include <memory>
@@ -43,64 +44,31 @@ protected:
     std::unique_ptr<memory_canvas> canvas_;
 };
 
-TEST_F(ToolkitState, ConstructionState) {
-    EXPECT_EQ(_mm_getcsr() & 0x8040u, 0x8040u);
-    EXPECT_EQ(tk->m_ShadowResolution, 8);
-    EXPECT_EQ(tk->m_ShadowResolutionShift, 3);
-    EXPECT_EQ(tk->m_FogDistance, 255.0f);
-    EXPECT_EQ(tk->m_Ambient, 1.15234375f);
-    EXPECT_TRUE(tk->m_Threads.empty_head());
-    EXPECT_EQ(tk->m_Textures, nullptr);
-    EXPECT_EQ(clip(), (std::vector<int>{0, 0, 0, 0}));
-}
-
-TEST_F(ToolkitState, CanvasActivationClearsAndSetsTheTarget) {
-    memory_canvas c(64, 48);
-    for (int i = 0; i < 64 * 48; ++i) {
-        c.colourbuffer()[i] = 0x12345678;
-        c.depthbuffer()[i] = 1.0f;
+TEST_F(ToolkitState, CanvasActivationAndClipping) {
+    EXPECT_EQ(_mm_getcsr() & 0x8040u, 0x8040u);  // flush-to-zero and denormals-are-zero
+    canvas_.reset(new memory_canvas(640, 480));
+    std::fill(canvas_->colourbuffer(), canvas_->colourbuffer() + 640 * 480, 0x12345678u);
+    std::fill(canvas_->depthbuffer(), canvas_->depthbuffer() + 640 * 480, 1.0f);
+    tk->set_active_canvas(canvas_.get());
+    for (int i = 0; i < 640 * 480; i += 997) {  // activation clears both buffers
+        ASSERT_EQ(canvas_->colourbuffer()[i], 0u);
+        ASSERT_EQ(canvas_->depthbuffer()[i], 3.4e38f);
     }
-    tk->set_active_canvas(&c);
-    EXPECT_EQ(tk->m_Width, 64);
-    EXPECT_EQ(tk->m_Height, 48);
-    EXPECT_EQ(Rasterizer_n::m_pColourBuffer, c.colourbuffer());
-    EXPECT_EQ(Rasterizer_n::m_ScreenPitch, 64);
-    EXPECT_EQ(Rasterizer_n::GetViewport()->Width, 64);
-    EXPECT_EQ(clip(), (std::vector<int>{0, 0, 64, 48}));
-    for (int i = 0; i < 64 * 48; ++i) {
-        ASSERT_EQ(c.colourbuffer()[i], 0u);
-        ASSERT_EQ(c.depthbuffer()[i], 3.4e38f);
-    }
-    tk->set_active_canvas(nullptr);
-    EXPECT_EQ(Rasterizer_n::m_pColourBuffer, nullptr);
-    EXPECT_EQ(Rasterizer_n::m_pDepthBuffer, nullptr);
-    EXPECT_EQ(Rasterizer_n::m_ScreenPitch, 0);
-    EXPECT_EQ(tk->m_ColourBuffer, nullptr);
-}
-
-TEST_F(ToolkitState, ClippingAndSubClipping) {
-    attach(640, 480);
     tk->setclipping(-5, -5, 10000, 10000);
     EXPECT_EQ(clip(), (std::vector<int>{0, 0, 640, 480}));
     tk->setclipping(10, 20, 300, 200);
     tk->setsubclipping(0, 50, 400, 150);
     EXPECT_EQ(clip(), (std::vector<int>{10, 50, 300, 150}));
-    // Disjoint: left > right, which draws nothing.
-    tk->setsubclipping(500, 0, 600, 480);
-    std::vector<int> c = clip();
-    EXPECT_GT(c[0], c[2]);
-    EXPECT_EQ(c, (std::vector<int>{500, 50, 300, 150}));
-    // No further checks: left may exceed right.
-    tk->setclipping(200, 10, 100, 20);
-    EXPECT_EQ(clip(), (std::vector<int>{200, 10, 100, 20}));
+    tk->setsubclipping(500, 0, 600, 480);  // disjoint: left > right draws nothing
+    EXPECT_EQ(clip(), (std::vector<int>{500, 50, 300, 150}));
     tk->resetclipping();
     EXPECT_EQ(clip(), (std::vector<int>{0, 0, 640, 480}));
-}
+    tk->set_active_canvas(nullptr);
+    EXPECT_EQ(Rasterizer_n::m_pColourBuffer, nullptr);
+    tk->scroll(1, 1);  // without a target nothing happens
 
-TEST_F(ToolkitState, ShadowResolutionIsAPowerOfTwo) {
-    const int cases[][3] = {{100, 64, 6}, {1, 1, 0}, {0, 1, 0}, {-7, 1, 0}, {2, 2, 1}, {3, 2, 1}, {4096, 4096, 12},
-                            {0x7FFFFFFF, 1 << 30, 30}};
-    for (const auto& c : cases) {
+    const int cases[][3] = {{100, 64, 6}, {0, 1, 0}, {-7, 1, 0}, {3, 2, 1}, {0x7FFFFFFF, 1 << 30, 30}};
+    for (const auto& c : cases) {  // shadow resolution: a power of two
         tk->set_shadow_resolution(c[0]);
         EXPECT_EQ(tk->m_ShadowResolution, c[1]) << c[0];
         EXPECT_EQ(tk->m_ShadowResolutionShift, c[2]) << c[0];
@@ -113,7 +81,7 @@ float lane(__m128 v, int i) {
     return f[i];
 }
 
-TEST_F(ToolkitState, PointLightsAreClampedToFour) {
+TEST_F(ToolkitState, PointLightsAndSun) {
     std::vector<int> lights;
     std::vector<float> intensity;
     for (int i = 0; i < 7; ++i) {
@@ -122,34 +90,20 @@ TEST_F(ToolkitState, PointLightsAreClampedToFour) {
         intensity.push_back(i == 1 ? 2.5f : 0.25f * float(i));
     }
     tk->set_pointlights(7, lights.data(), intensity.data());
-    EXPECT_EQ(tk->m_PointLightCount, 4);
-    for (int i = 0; i < 4; ++i) {
-        EXPECT_EQ(lane(tk->m_PointLightPositions[i], 0), float(100 * i));
-        EXPECT_EQ(lane(tk->m_PointLightPositions[i], 1), float(-5 * i));
-        EXPECT_EQ(lane(tk->m_PointLightPositions[i], 2), float(7 + i));
-        EXPECT_EQ(tk->m_PointLightColours[i], 0xFF000000u + unsigned(i));
-    }
+    EXPECT_EQ(tk->m_PointLightCount, 4);  // clamped to four
+    EXPECT_EQ(lane(tk->m_PointLightPositions[3], 1), -15.0f);
+    EXPECT_EQ(tk->m_PointLightColours[3], 0xFF000003u);
     EXPECT_EQ(tk->m_PointLightScales[1], 1.0f * 121.0f * 256.0f);  // intensity 2.5 counts as 1
     EXPECT_EQ(tk->m_PointLightScales[2], 0.5f * 144.0f * 256.0f);
-    EXPECT_EQ(tk->m_PointLightScales[0], 0.0f);
-    // The squared radius is a 32-bit integer product.
-    int big[5] = {0, 0, 0, 50000, 0};
+    int big[5] = {0, 0, 0, 50000, 0};  // the squared radius is a 32-bit integer product
     float one = 1.0f;
     tk->set_pointlights(1, big, &one);
     EXPECT_EQ(tk->m_PointLightScales[0], float(int(50000u * 50000u)) * 256.0f);
-    tk->set_pointlights(-3, nullptr, nullptr);
-    EXPECT_EQ(tk->m_PointLightCount, -3);
-}
 
-TEST_F(ToolkitState, SunDirectionAndShadowSteps) {
     tk->set_globalsun(0x00FF8010, 0.5f, 1.5f, 3.0f, 4.0f, 0.0f);
-    EXPECT_EQ(tk->m_SunColour[0], 0xFF);
     EXPECT_EQ(tk->m_SunColour[1], 0x80);
-    EXPECT_EQ(tk->m_SunColour[2], 0x10);
     EXPECT_NEAR(tk->m_SunDirection[0], 0.6f, 1e-6);
-    EXPECT_NEAR(tk->m_SunDirection[1], 0.8f, 1e-6);
     EXPECT_EQ(tk->m_ShadowStepX, 192);
-    EXPECT_EQ(tk->m_ShadowStepZ, 0);
     tk->set_globalsun(0, 1, 1, -1.0f, 2.0f, -4.0f);
     EXPECT_EQ(tk->m_ShadowStepX, -128);
     EXPECT_EQ(tk->m_ShadowStepZ, -512);
@@ -188,17 +142,11 @@ TEST_F(ToolkitState, ProjectionSetsDepthRangeAndMovesTheFogStart) {
     EXPECT_NEAR(Rasterizer_n::m_ZNear, 50.0f, 50.0f * 1e-3f);
     EXPECT_NE(Rasterizer_n::m_DistanceFogStart, before);
     EXPECT_NEAR(Rasterizer_n::m_DistanceFogStart, expected_fog_start(p, 500.0f), 1e-6);
-    EXPECT_GT(Rasterizer_n::m_DistanceFogStart, 0.9f);
-    EXPECT_LT(Rasterizer_n::m_DistanceFogStart, 1.0f);
     EXPECT_EQ(lane(Rasterizer_n::m_DistanceFogColour, 0), 0x30 * 256.0f);
-    EXPECT_EQ(lane(Rasterizer_n::m_DistanceFogColour, 3), 0xFF * 256.0f);
-    // The camera moves the frustum, not the depth range.
     const float cam[16] = {1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, 10, 20, 30, 1};
     float zfar = Rasterizer_n::m_ZFar;
-    tk->set_camera(Matrix_c(cam));
+    tk->set_camera(Matrix_c(cam));  // the camera moves the frustum, not the depth range
     EXPECT_EQ(Rasterizer_n::m_ZFar, zfar);
-    EXPECT_NE(lane(tk->m_Frustum[4], 3), 0.0f);
-
     // A negative fog distance counts as 0.
     tk->set_fog(0, -100);
     float atNegative = Rasterizer_n::m_DistanceFogStart;
@@ -211,23 +159,15 @@ TEST_F(ToolkitState, ProjectionSetsDepthRangeAndMovesTheFogStart) {
 TEST_F(ToolkitState, UnderwaterModeSavesAndRestoresTheFogColour) {
     tk->set_fog(0xFF112233, 100);
     tk->underwatermode_enable(-200, 0x80FF4020, 400, 12345);
-    EXPECT_TRUE(tk->m_Underwater);
     EXPECT_EQ(tk->m_FogColour, 0x80FF4020u);
-    EXPECT_EQ(tk->m_HeightFogStart, -200.0f);
     EXPECT_EQ(tk->m_HeightFogScale, -1.0f / 400.0f);
-    EXPECT_EQ(lane(Rasterizer_n::m_HeightFogColour, 0), 8192.0f);
-    EXPECT_EQ(lane(Rasterizer_n::m_HeightFogColour, 1), 16384.0f);
     EXPECT_EQ(lane(Rasterizer_n::m_HeightFogColour, 2), 65280.0f);
     EXPECT_EQ(lane(Rasterizer_n::m_HeightFogColour, 3), 32768.0f);
-    // Adjusting keeps the saved colour and the flag.
-    tk->underwatermode_adjust(-100, 0x00000010, 50, 0);
-    EXPECT_EQ(tk->m_FogColour, 0x10u);
-    EXPECT_EQ(tk->m_UnderwaterDepth, 50);
+    tk->underwatermode_adjust(-100, 0x00000010, 50, 0);  // keeps the saved colour
     tk->underwatermode_disable();
     EXPECT_FALSE(tk->m_Underwater);
     EXPECT_EQ(tk->m_FogColour, 0xFF112233u);
-    // The height fog stays as it was.
-    EXPECT_EQ(lane(Rasterizer_n::m_HeightFogColour, 0), 16.0f * 256.0f);
+    EXPECT_EQ(lane(Rasterizer_n::m_HeightFogColour, 0), 16.0f * 256.0f);  // height fog stays
 }
 
 // Element-wise reference of the linear scroll.
@@ -262,9 +202,6 @@ TEST_F(ToolkitState, ScrollMovesBothBuffersEitherWay) {
             ASSERT_EQ(canvas_->depthbuffer()[i], depth[size_t(i)]) << m[0] << "," << m[1] << " at " << i;
         }
     }
-    // Without a target nothing happens.
-    tk->set_active_canvas(nullptr);
-    tk->scroll(1, 1);
 }
 
 }  // namespace

@@ -49,10 +49,6 @@ JNIEXPORT jboolean JNICALL Java_MemoryTexturesNatives_intact(JNIEnv* env, jclass
     });
 }
 
-JNIEXPORT jint JNICALL Java_MemoryTexturesNatives_length(JNIEnv* env, jclass, jlong holder) {
-    return guarded(env, [&] { return jint(from_id_checked<allocatedmemory_autopointer>(holder)->length()); });
-}
-
 JNIEXPORT void JNICALL Java_MemoryTexturesNatives_release(JNIEnv* env, jclass, jlong holder) {
     guarded(env, [&] { delete from_id_checked<allocatedmemory_autopointer>(holder); });
 }
@@ -61,11 +57,6 @@ JNIEXPORT jint JNICALL Java_MemoryTexturesNatives_capacity(JNIEnv* env, jclass, 
     return guarded(env, [&] { return jint(pool_of(env, poolpeer).capacity); });
 }
 
-JNIEXPORT jint JNICALL Java_MemoryTexturesNatives_blockCount(JNIEnv* env, jclass, jobject poolpeer) {
-    return guarded(env, [&] { return jint(pool_of(env, poolpeer).block_count()); });
-}
-
-// The pool the toolkit with native id `tk` uses (as a native address).
 JNIEXPORT jlong JNICALL Java_MemoryTexturesNatives_toolkitPool(JNIEnv* env, jclass, jlong tk) {
     return guarded(env, [&] {
         return jlong(reinterpret_cast<intptr_t>(from_id_checked<toolkit>(tk)->m_MemoryPool));
