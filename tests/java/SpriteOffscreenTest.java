@@ -67,20 +67,16 @@ class SpriteOffscreenTest {
         int[] palette = {0x00C0FFEE, 0x00112233, 0x80445566};
         byte[] idx = {0, 1, 2, 1};
         byte[] alpha = {0x10, 0x20, (byte) 0xF0, 0};
-        fa a = new fa(), b = new fa();
-        a.EA(null, palette, idx, null, 0, 2, 2, 2);
-        b.EA(null, palette, idx, alpha, 0, 2, 2, 2);
+        fa a = new fa();
+        a.EA(null, palette, idx, alpha, 0, 2, 2, 2);
         try {
             tk.d(a.nativeid, 0);
-            assertArrayEquals(new int[] {0, 0xFF112233, 0xFF445566, 0xFF112233}, tk.E(0, 0, 2, 2));
-            tk.d(b.nativeid, 0);
             assertArrayEquals(new int[] {0x10C0FFEE, 0x20112233, 0xF0445566, 0x00112233}, tk.E(0, 0, 2, 2));
         } finally {
             tk.d(0, 0);
             a.M(a.nativeid);
-            b.M(b.nativeid);
         }
-        // an index beyond the palette is refused before a sprite exists
+        // an index beyond the palette or a short array is refused before a sprite exists
         fa c = new fa();
         assertThrows(ArrayIndexOutOfBoundsException.class, () -> c.EA(null, palette, new byte[] {3}, null, 0, 1, 1, 1));
         assertThrows(ArrayIndexOutOfBoundsException.class, () -> c.EA(null, palette, idx, alpha, 0, 2, 2, 3));
@@ -105,60 +101,17 @@ class SpriteOffscreenTest {
     }
 
     @Test
-    void offscreenPairIsTheTarget() {
-        oa depth = new oa();
-        depth.g(40, 30);
-        fa s = target(40, 30, 0x01010101, depth);
-        try {
-            assertArrayEquals(new int[] {0, 0, 40, 30}, Pavoqen.clipping(tk));
-            assertArrayEquals(new int[] {0, 0, 40, 30}, Pavoqen.viewport(tk));
-            int[] in = new int[3 + 5 * 4];
-            for (int i = 0; i < in.length; ++i) in[i] = 0x5A000000 + i;
-            tk.BA(10, 20, 4, 3, in, 3, 5);  // offset 3, stride 5
-            int[] back = tk.E(10, 20, 4, 3);
-            for (int j = 0; j < 3; ++j)
-                for (int i = 0; i < 4; ++i) assertEquals(in[3 + j * 5 + i], back[j * 4 + i]);
-            // partly outside: the inside part is written, the rest of the array is zero
-            tk.BA(38, 28, 4, 4, new int[16], 0, 4);
-            int[] edge = tk.E(37, 27, 5, 5);
-            assertEquals(25, edge.length);
-            assertEquals(0, edge[1 * 5 + 1], "written inside");
-            assertEquals(0x01010101, edge[1 * 5 + 0], "left of the rectangle: kept");
-            assertEquals(0, edge[0 * 5 + 4], "outside the target reads back as 0");
-            assertEquals(0, tk.E(-100, -100, 3, 3)[4]);
-        } finally {
-            tk.d(0, 0);
-            s.M(s.nativeid);
-            depth.za(depth.nativeid);
-        }
-        assertEquals(0L, depth.nativeid);
-    }
-
-    @Test
-    void depthOnlyTargetHasNoColourBuffer() {
-        oa depth = new oa();
-        depth.g(24, 16);
-        try {
-            tk.d(0, depth.nativeid);
-            assertArrayEquals(new int[] {0, 0, 24, 16}, Pavoqen.clipping(tk));
-            Exception e = assertThrows(Exception.class, () -> tk.E(0, 0, 1, 1));
-            assertEquals(Exception.class, e.getClass());
-            assertEquals("No colour buffer", e.getMessage());
-            tk.BA(0, 0, 1, 1, new int[1], 0, 1);  // nothing to write into: harmless
-            tk.ba(2, 0);  // depth clear works
-        } finally {
-            tk.d(0, 0);
-            depth.za(depth.nativeid);
-        }
-    }
-
-    @Test
-    void badSizesAndShortArrays() {
+    void areaWriteReadAndBadInput() {
         fa s = target(8, 8, 0x01010101, null);
         try {
+            int[] in = new int[3 + 5 * 3];
+            for (int i = 0; i < in.length; ++i) in[i] = 0x5A000000 + i;
+            tk.BA(5, 6, 4, 3, in, 3, 5);  // offset 3, stride 5, partly outside
+            int[] back = tk.E(5, 6, 4, 3);
+            assertEquals(in[3 + 5 + 2], back[4 + 2]);
+            assertEquals(0, back[2 * 4 + 3], "outside the target reads back as 0");
             int[] before = tk.E(0, 0, 8, 8);
             assertThrows(ArrayIndexOutOfBoundsException.class, () -> tk.BA(0, 0, 4, 4, new int[15], 0, 4));
-            assertThrows(ArrayIndexOutOfBoundsException.class, () -> tk.BA(0, 0, 4, 4, new int[16], 1, 4));
             assertThrows(ArrayIndexOutOfBoundsException.class, () -> tk.BA(0, 0, 4, 4, new int[16], -1, 4));
             assertThrows(ArrayIndexOutOfBoundsException.class, () -> tk.BA(0, 0, 4, 2, new int[16], 0, -4));
             assertThrows(NullPointerException.class, () -> tk.BA(0, 0, 4, 4, null, 0, 4));
@@ -166,16 +119,11 @@ class SpriteOffscreenTest {
             assertArrayEquals(before, tk.E(0, 0, 8, 8), "nothing written by the refused calls");
             assertThrows(IllegalArgumentException.class, () -> tk.E(0, 0, -1, 4));
             assertThrows(IllegalArgumentException.class, () -> tk.E(0, 0, 65536, 65536));
-            assertEquals(0, tk.E(3, 3, 0, 5).length);
-
             fa t = new fa();
-            assertThrows(IllegalArgumentException.class, () -> t.UA(0, -1, 5));
             assertThrows(IllegalArgumentException.class, () -> t.UA(0, 65536, 16384));
             assertThrows(ArrayIndexOutOfBoundsException.class, () -> t.RA(null, new int[11], 0, 4, 4, 3, false));
-            assertThrows(ArrayIndexOutOfBoundsException.class, () -> t.RA(null, new int[12], 0, -4, 4, 3, false));
             assertThrows(IllegalArgumentException.class, () -> new oa().g(-2, 2));
             assertEquals(0L, t.nativeid);
-
             // the decorated screen grab is not bound by name
             assertThrows(UnsatisfiedLinkError.class, () -> t.K(null, null, 0, 0, 2, 2, false));
         } finally {
@@ -185,7 +133,7 @@ class SpriteOffscreenTest {
     }
 
     @Test
-    void writeIntoSpriteAndGrabFromTheScreen() {
+    void grabFromTheScreen() {
         fa screen = target(16, 12, 0, null);
         fa grab = new fa();
         grab.UA(0, 6, 4);
@@ -193,34 +141,24 @@ class SpriteOffscreenTest {
             int[] px = new int[16 * 12];
             for (int i = 0; i < px.length; ++i) px[i] = (i % 3 == 0) ? 0 : 0x00100000 + i;
             tk.BA(0, 0, 16, 12, px, 0, 16);
-            // grab 4 x 3 at screen (13, 10) into the sprite at (1, 0): clipped at the screen's edges
             int[] fill = new int[24];
             java.util.Arrays.fill(fill, 0x77777777);
             grab.na(grab.nativeid, 0, 0, 6, 4, fill, 0, 6);
-            grab.ea(grab.nativeid, 1, 0, 4, 3, 13, 10);
+            grab.ea(grab.nativeid, 1, 0, 4, 3, 13, 10);  // clipped at the screen's edges, keyed
+            grab.j(grab.nativeid, 0, 0, 1);  // alpha from the screen's green channel
+            assertThrows(IllegalArgumentException.class, () -> grab.j(grab.nativeid, 0, 0, 4));
             tk.d(grab.nativeid, 0);
             int[] got = tk.E(0, 0, 6, 4);
             for (int y = 0; y < 4; ++y)
                 for (int x = 0; x < 6; ++x) {
-                    int sx = x - 1 + 13, sy = y + 10;
-                    int expect = 0x77777777;
+                    int sx = x - 1 + 13, sy = y + 10, expect = 0x77777777;
                     if (x >= 1 && x < 5 && y < 3 && sx < 16 && sy < 12) {
                         int v = px[sy * 16 + sx];
                         expect = v == 0 ? 0 : v | 0xFF000000;
                     }
+                    expect = (expect & 0xFFFFFF) | ((px[y * 16 + x] & 0xFF00) << 16);
                     assertEquals(expect, got[y * 6 + x], "at " + x + "," + y);
                 }
-            // alpha from the screen's green channel
-            tk.d(screen.nativeid, 0);
-            grab.j(grab.nativeid, 0, 0, 1);
-            tk.d(grab.nativeid, 0);
-            int[] alpha = tk.E(0, 0, 6, 4);
-            assertEquals((px[16 + 2] & 0xFF00) << 16, alpha[6 + 2] & 0xFF000000);
-            tk.d(screen.nativeid, 0);
-            assertThrows(IllegalArgumentException.class, () -> grab.j(grab.nativeid, 0, 0, 4));
-            tk.d(0, 0);
-            Exception e = assertThrows(Exception.class, () -> grab.ea(grab.nativeid, 0, 0, 1, 1, 0, 0));
-            assertEquals("No colour buffer", e.getMessage());
         } finally {
             tk.d(0, 0);
             screen.M(screen.nativeid);
@@ -229,11 +167,29 @@ class SpriteOffscreenTest {
     }
 
     @Test
-    void destroyingTheTargetDetachesIt() {
+    void noColourBufferAfterDestroyOrWithDepthOnly() {
         fa s = target(4, 4, 1, null);
         s.M(s.nativeid);
         Exception e = assertThrows(Exception.class, () -> tk.E(0, 0, 1, 1));
+        assertEquals(Exception.class, e.getClass());
         assertEquals("No colour buffer", e.getMessage());
+        oa depth = new oa();
+        depth.g(24, 16);
+        fa grab = new fa();
+        grab.UA(0, 2, 2);
+        try {
+            tk.d(0, depth.nativeid);
+            assertArrayEquals(new int[] {0, 0, 24, 16}, Pavoqen.clipping(tk));
+            e = assertThrows(Exception.class, () -> grab.ea(grab.nativeid, 0, 0, 1, 1, 0, 0));
+            assertEquals("No colour buffer", e.getMessage());
+            tk.BA(0, 0, 1, 1, new int[1], 0, 1);  // nothing to write into: harmless
+            tk.ba(2, 0);  // depth clear works
+        } finally {
+            tk.d(0, 0);
+            grab.M(grab.nativeid);
+            depth.za(depth.nativeid);
+        }
+        assertEquals(0L, depth.nativeid);
     }
 
     @Test
@@ -261,7 +217,6 @@ class SpriteOffscreenTest {
             tk.d(pair.nativeid, 0);
             got = tk.E(0, 0, 9, 7);
             assertEquals(0x22000000, got[0], "outside the source: untouched");
-            assertEquals(0x11111111, got[1 * 9 + 2]);
             assertEquals(0x11111111, got[4 * 9 + 4]);
             assertEquals(0x22000000 + 4 * 9 + 5, got[4 * 9 + 5]);
             // a toolkit id that is not the toolkit is refused
@@ -309,10 +264,7 @@ class SpriteOffscreenTest {
             // masked: row 0 covers x 1..2 from mask x 24
             s.o(s.nativeid, 24, 0, mask.nativeid, 24, 0);
             int[] row = tk.E(24, 0, 4, 1);
-            assertEquals(0, row[0]);
-            assertNotEquals(0, row[1]);
-            assertNotEquals(0, row[2]);
-            assertEquals(0, row[3]);
+            assertTrue(row[0] == 0 && row[1] != 0 && row[2] != 0 && row[3] == 0);
             s.FA(s.nativeid, 24, 4, 28, 4, 24, 8, 0, mask.nativeid, 24, 4, true);
             row = tk.E(24, 4, 4, 1);
             assertArrayEquals(new int[] {0, 0xFFFF0000, 0xFFFF0000, 0}, row);

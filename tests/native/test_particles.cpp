@@ -1,7 +1,5 @@
-// Particles: projection to a chosen screen position, size along the camera's
-// right axis, discs and textured blits compared with the primitives drawn
-// directly, skipped particles, culling, the truncation of positions, and
-// texture requests.
+// Particles against the primitives drawn directly: discs, textured blits,
+// skipped and culled particles, texture requests.
 #include <gtest/gtest.h>
 
 #include <cstdint>
@@ -104,43 +102,25 @@ struct ParticleScene : ::testing::Test {
 };
 
 TEST_F(ParticleScene, UntexturedIsADiscOfRadiusHalfTheSize) {
-    // size 20480 / 2048 = 10 world units = 10 pixels: D = 10, r = 5
-    particles({fx(20), fx(15), 0}, {int(0xC0FF8000u)}, {20480}, {-1});
+    // size 20480 / 2048 = 10 pixels: r = 5; positions truncate to whole units
+    particles({fx(20) + 4095, fx(15) + 4095, 4095}, {int(0xC0FF8000u)}, {20480}, {-1});
     on_reference([&] { tk->circle_fill(20, 15, 0.5f, 5, 0xC0FF8000u, 1); });
     EXPECT_TRUE(same_as_reference());
     EXPECT_NE(colour.Pixels[15 * W + 20], 0xFF102030u);
-    EXPECT_EQ(colour.Pixels[15 * W + 26], 0xFF102030u);
+    // the largest sizes (2^31 / 2048 = 2^20 pixels) are drawn safely, covering the target
+    particles({fx(20), fx(15), 0, fx(20), fx(15), 0}, {-1, -1}, {0x7FFFFFFF, int(0x80000000u)}, {-1, -1});
+    EXPECT_EQ(colour.Pixels[0], 0xFFFFFFFFu);
 }
-
 TEST_F(ParticleScene, SkippedParticles) {
     particles({fx(20), fx(15), 0, fx(30), fx(20), 0}, {-1, -1}, {1000, 0}, {-1, -1});  // sizes round to 0
+    particles({fx(20), fx(15), fx(-3), fx(30), fx(15), fx(-2)}, {-1, -1}, {20480, 20480}, {-1, -1});  // before near
+    particles({fx(-20), fx(15), 0, fx(20), fx(200), 0}, {-1, -1}, {20480, 20480}, {-1, -1});  // off screen
+    particles({fx(20), fx(15), 0}, {}, {}, {});  // count 0
     EXPECT_TRUE(untouched());
-    // behind the near depth bound (screen depth below 0)
-    particles({fx(20), fx(15), fx(-3), fx(30), fx(15), fx(-2)}, {-1, -1}, {20480, 20480}, {-1, -1});
-    EXPECT_TRUE(untouched());
-    // outside the screen
-    particles({fx(-20), fx(15), 0, fx(20), fx(200), 0}, {-1, -1}, {20480, 20480}, {-1, -1});
-    EXPECT_TRUE(untouched());
-    // behind what the depth buffer already holds
-    for (int i = 0; i < W * H; ++i) depth.Data[i] = 0.25f;
+    for (int i = 0; i < W * H; ++i) depth.Data[i] = 0.25f;  // behind what the depth buffer holds
     particles({fx(20), fx(15), 0}, {-1}, {20480}, {-1});
     EXPECT_TRUE(untouched());
-    // a count below 1 draws nothing
-    particles({fx(20), fx(15), 0}, {}, {}, {});
-    EXPECT_TRUE(untouched());
 }
-
-TEST_F(ParticleScene, PositionsAreTruncatedToWholeUnits) {
-    particles({fx(20) + 4095, fx(15) + 4095, 4095}, {int(0xFF00FF00u)}, {12288}, {-1});
-    on_reference([&] {
-        std::vector<int> pos = {fx(20), fx(15), 0}, col = {int(0xFF00FF00u)}, size = {12288};
-        std::vector<short> tex = {-1};
-        tr->render_particles<true, true>(pos.data(), col.data(), size.data(), tex.data(), 1);
-    });
-    EXPECT_TRUE(same_as_reference());
-    EXPECT_FALSE(untouched());
-}
-
 TEST_F(ParticleScene, TexturedIsAScaledBlitOfTheRequestedTexture) {
     const std::vector<int> px = texels(0x1234);
     texturemetrics m = {};
@@ -180,12 +160,6 @@ TEST_F(ParticleScene, DepthOnlyTargetLeavesNoTrace) {
     tk->start_offscreen_render(&colour, &depth);
     EXPECT_TRUE(untouched());
     for (int i = 0; i < W * H; ++i) ASSERT_EQ(depth.Data[i], 3.4e38f);
-}
-
-TEST_F(ParticleScene, LargestSizesAreDrawnSafely) {
-    particles({fx(20), fx(15), 0, fx(20), fx(15), 0}, {-1, -1}, {0x7FFFFFFF, int(0x80000000u)}, {-1, -1});
-    // 2^31 / 2048 = 2^20 pixels: within range, drawn as a disc covering the target
-    EXPECT_EQ(colour.Pixels[0], 0xFFFFFFFFu);
 }
 
 }  // namespace
