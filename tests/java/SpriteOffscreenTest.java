@@ -42,11 +42,16 @@ class SpriteOffscreenTest {
     }
 
     @Test
-    void argbSpriteWithAndWithoutKey() {
+    void spritesFromArgbAndPalettisedArrays() {
         int[] px = {0x00000000, 0x00123456, 0x80FFFFFF, 7, 0x11111111, 0x22222222, 0x01000000, 0, 9, 9};
-        fa plain = new fa(), keyed = new fa();
+        int[] palette = {0x00C0FFEE, 0x00112233, 0x80445566};
+        byte[] idx = {0, 1, 2, 1};
+        byte[] alpha = {0x10, 0x20, (byte) 0xF0, 0};
+        fa plain = new fa(), keyed = new fa(), pal = new fa(), opaque = new fa();
         plain.RA(null, px, 0, 5, 3, 2, false);  // stride 5: the last two words of each row are not used
         keyed.RA(null, px, 0, 5, 3, 2, true);
+        pal.EA(null, palette, idx, alpha, 0, 2, 2, 2);
+        opaque.EA(null, palette, idx, null, 0, 2, 2, 2);  // index 0 transparent, the rest opaque
         try {
             assertEquals(3, plain.da(plain.nativeid));
             assertEquals(2, plain.GA(plain.nativeid));
@@ -54,28 +59,18 @@ class SpriteOffscreenTest {
             assertArrayEquals(new int[] {0, 0x00123456, 0x80FFFFFF, 0x22222222, 0x01000000, 0}, tk.E(0, 0, 3, 2));
             tk.d(keyed.nativeid, 0);
             assertArrayEquals(new int[] {0, 0xFF123456, 0xFFFFFFFF, 0xFF222222, 0xFF000000, 0}, tk.E(0, 0, 3, 2));
+            tk.d(pal.nativeid, 0);
+            assertArrayEquals(new int[] {0x10C0FFEE, 0x20112233, 0xF0445566, 0x00112233}, tk.E(0, 0, 2, 2));
+            tk.d(opaque.nativeid, 0);
+            assertArrayEquals(new int[] {0, 0xFF112233, 0xFF445566, 0xFF112233}, tk.E(0, 0, 2, 2));
         } finally {
             tk.d(0, 0);
             plain.M(plain.nativeid);
             keyed.M(keyed.nativeid);
+            pal.M(pal.nativeid);
+            opaque.M(opaque.nativeid);
         }
         assertEquals(0L, plain.nativeid);
-    }
-
-    @Test
-    void palettisedSprites() {
-        int[] palette = {0x00C0FFEE, 0x00112233, 0x80445566};
-        byte[] idx = {0, 1, 2, 1};
-        byte[] alpha = {0x10, 0x20, (byte) 0xF0, 0};
-        fa a = new fa();
-        a.EA(null, palette, idx, alpha, 0, 2, 2, 2);
-        try {
-            tk.d(a.nativeid, 0);
-            assertArrayEquals(new int[] {0x10C0FFEE, 0x20112233, 0xF0445566, 0x00112233}, tk.E(0, 0, 2, 2));
-        } finally {
-            tk.d(0, 0);
-            a.M(a.nativeid);
-        }
         // an index beyond the palette or a short array is refused before a sprite exists
         fa c = new fa();
         assertThrows(ArrayIndexOutOfBoundsException.class, () -> c.EA(null, palette, new byte[] {3}, null, 0, 1, 1, 1));
