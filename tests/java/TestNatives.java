@@ -42,13 +42,10 @@ final class TestNatives {
 
     /** Adds 1 to (or toggles) every element through a copied or pinned wrapper; returns the length seen. */
     static native int copiedInts(int[] a, boolean readOnly);
-    static native int copiedShorts(short[] a, boolean readOnly);
     static native int copiedBytes(byte[] a, boolean readOnly);
     static native int copiedBooleans(boolean[] a, boolean readOnly);
     static native int copiedFloats(float[] a, boolean readOnly);
     static native int pinnedInts(int[] a, boolean readOnly);
-    static native int pinnedFloats(float[] a, boolean readOnly);
-    static native int pinnedShorts(short[] a, boolean readOnly);
     static native int pinnedBooleans(boolean[] a, boolean readOnly);
 
     /** Pins (or copies) {@code a} read-write, sets a[0] = 99, then throws {@code kind}. */

@@ -40,118 +40,79 @@ unsigned int reference_hsl(unsigned int v) {
     return out;
 }
 
-TEST(Palette, KnownValuesAndWholeTable) {
+TEST(Palette, WholeTableMatchesTheColourModel) {
     colourutils::init();
     EXPECT_EQ(colourutils::hsl_2_rgb(0), 0x000000u);
-    unsigned long long sumOurs = 0, sumRef = 0;
-    unsigned int brightest = 0;
     int mismatches = 0;
     for (unsigned int v = 0; v < 65536; ++v) {
-        unsigned int c = colourutils::coltab[v];
-        EXPECT_EQ(c >> 24, 0u) << v;
-        unsigned int r = reference_hsl(v);
+        unsigned int c = colourutils::coltab[v], r = reference_hsl(v);
         if (c != r && ++mismatches < 5) ADD_FAILURE() << "hsl " << v << " got " << std::hex << c << " want " << r;
-        sumOurs += c * (unsigned long long)(v + 1);
-        sumRef += r * (unsigned long long)(v + 1);
-        for (int k = 0; k < 3; ++k) brightest = std::max(brightest, (c >> (8 * k)) & 0xFF);
     }
-    EXPECT_EQ(sumOurs, sumRef);
-    EXPECT_EQ(brightest, 255u);
+    EXPECT_EQ(mismatches, 0);
 }
 
 TEST(TrigTables, ValuesAndWrap) {
     mymath::init();
-    EXPECT_EQ(mymath::sin(0), 0.0f);
     EXPECT_EQ(mymath::cos(0), 1.0f);
     EXPECT_EQ(mymath::sin(4096), 1.0f);
-    EXPECT_NEAR(mymath::cos(4096), 0.0f, 1e-6f);
     EXPECT_EQ(mymath::sin(16384 + 5), mymath::sin(5));
     EXPECT_EQ(mymath::sin(5), sinf(5.0f * 0.0003834952f));
-    EXPECT_FLOAT_EQ(float(mymath::TRIG_ANGLEREVERSEFACTOR), 2607.594482421875f);
 }
 
-TEST(Matrix, FrustumPlanesOfIdentity) {
-    Matrix_c m;
+TEST(Matrix, FrustumPlanesOfIdentityAndRowVectorMultiply) {
     __m128 planes[6];
-    m.ExtractFrustumPlanes(planes);
+    Matrix_c().ExtractFrustumPlanes(planes);
     const float want[6][4] = {{1, 0, 0, 1}, {-1, 0, 0, 1}, {0, 1, 0, 1}, {0, -1, 0, 1}, {0, 0, 1, 1}, {0, 0, -1, 1}};
+    alignas(16) float p[4];
     for (int i = 0; i < 6; ++i) {
-        alignas(16) float p[4];
         _mm_store_ps(p, planes[i]);
         for (int k = 0; k < 4; ++k) EXPECT_NEAR(p[k], want[i][k], 1.5f / 4096.0f) << i << "," << k;
     }
+    float a[16] = {1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, 10, 20, 30, 1};  // translation
+    float b[16] = {2, 0, 0, 0, 0, 3, 0, 0, 0, 0, 4, 0, 0, 0, 0, 1};     // scale
+    _mm_store_ps(p, Matrix_c(a).Multiply(Matrix_c(b)).TransformPoint(1, 1, 1));
+    EXPECT_TRUE(p[0] == 22.0f && p[1] == 63.0f && p[2] == 124.0f && p[3] == 1.0f);  // translate first
 }
 
-TEST(Matrix, MultiplyIsRowVectorConvention) {
-    float a[16] = {1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, 10, 20, 30, 1};   // translation
-    float b[16] = {2, 0, 0, 0, 0, 3, 0, 0, 0, 0, 4, 0, 0, 0, 0, 1};      // scale
-    Matrix_c ab = Matrix_c(a).Multiply(Matrix_c(b));
-    alignas(16) float p[4];
-    _mm_store_ps(p, ab.TransformPoint(1, 1, 1));
-    EXPECT_FLOAT_EQ(p[0], 22.0f);  // translate first, then scale
-    EXPECT_FLOAT_EQ(p[1], 63.0f);
-    EXPECT_FLOAT_EQ(p[2], 124.0f);
-    EXPECT_FLOAT_EQ(p[3], 1.0f);
-}
-
-TEST(RasterizerState, ViewportAndCuller) {
-    Rasterizer_n::Viewport_s vp = {0, 0, 640, 480, 0.0f, 1.0f};
-    Rasterizer_n::SetViewport(vp);
+TEST(RasterizerState, ViewportCullerAndFog) {
+    Rasterizer_n::Viewport_s vp2 = {10, 20, 100, 50, -0.5f, 1.0f};
+    Rasterizer_n::SetViewport(vp2);
     alignas(16) float mul[4], add[4];
     _mm_store_ps(mul, Rasterizer_n::m_ViewportMul);
     _mm_store_ps(add, Rasterizer_n::m_ViewportAdd);
-    EXPECT_EQ(mul[0], 320.0f); EXPECT_EQ(mul[1], 240.0f); EXPECT_EQ(mul[2], 0.5f); EXPECT_EQ(mul[3], 1.0f);
-    EXPECT_EQ(add[0], 320.0f); EXPECT_EQ(add[1], 240.0f); EXPECT_EQ(add[2], 0.5f); EXPECT_EQ(add[3], 0.0f);
     alignas(16) short lanes[8];
     _mm_store_si128(reinterpret_cast<__m128i*>(lanes), Rasterizer_n::m_TriangleCuller);
-    const short want[8] = {640, 480, 32767, 0, 0, 0, 0, 0};
+    const short want[8] = {110, 70, 32767, -16383, 10, 20, 0, 0};
     for (int i = 0; i < 8; ++i) EXPECT_EQ(lanes[i], want[i]) << i;
-
-    Rasterizer_n::Viewport_s vp2 = {10, 20, 100, 50, -0.5f, 1.0f};
-    Rasterizer_n::SetViewport(vp2);
-    _mm_store_si128(reinterpret_cast<__m128i*>(lanes), Rasterizer_n::m_TriangleCuller);
-    const short want2[8] = {110, 70, 32767, -16383, 10, 20, 0, 0};
-    for (int i = 0; i < 8; ++i) EXPECT_EQ(lanes[i], want2[i]) << i;
-}
-
-TEST(RasterizerState, FogParameters) {
+    EXPECT_TRUE(mul[0] == 50.0f && mul[1] == 25.0f && mul[2] == 0.75f && add[0] == 60.0f && add[1] == 45.0f && add[2] == 0.25f);
     Rasterizer_n::RecomputeDistanceFogParams(0.5f, 0x80FF4020u);
-    EXPECT_EQ(Rasterizer_n::m_DistanceFogStart, 0.5f);
     EXPECT_EQ(Rasterizer_n::m_InvDistanceFogRange, 2.0f);
     alignas(16) float c[4];
     _mm_store_ps(c, Rasterizer_n::m_DistanceFogColour);
-    EXPECT_EQ(c[0], 8192.0f);
-    EXPECT_EQ(c[1], 16384.0f);
-    EXPECT_EQ(c[2], 65280.0f);
-    EXPECT_EQ(c[3], 32768.0f);
+    EXPECT_TRUE(c[0] == 8192.0f && c[1] == 16384.0f && c[2] == 65280.0f && c[3] == 32768.0f);
 }
 
 TEST(RasterizerState, CullerStrictNearAndBounds) {
     Rasterizer_n::Viewport_s vp = {0, 0, 640, 480, 0.0f, 1.0f};
     Rasterizer_n::SetViewport(vp);
     auto v = [](float x, float y, float z) { return _mm_setr_ps(x, y, z, 1.0f); };
-    // inside
-    EXPECT_TRUE(Rasterizer_n::CullTriangle<false>(v(10, 10, 0.5f), v(100, 10, 0.5f), v(10, 100, 0.5f)));
-    // all three on the near bound: the comparison is strict
-    EXPECT_FALSE(Rasterizer_n::CullTriangle<false>(v(10, 10, 0.0f), v(100, 10, 0.0f), v(10, 100, 0.0f)));
-    // one vertex in front of the near bound is not enough
-    EXPECT_FALSE(Rasterizer_n::CullTriangle<false>(v(10, 10, 0.5f), v(100, 10, 0.0f), v(10, 100, 0.0f)));
-    // all right of the viewport
-    EXPECT_FALSE(Rasterizer_n::CullTriangle<false>(v(700, 10, 0.5f), v(800, 10, 0.5f), v(700, 100, 0.5f)));
-    // all left of column 0
-    EXPECT_FALSE(Rasterizer_n::CullTriangle<false>(v(-5, 10, 0.5f), v(-1, 10, 0.5f), v(-3, 100, 0.5f)));
-    // straddling the left edge is kept
-    EXPECT_TRUE(Rasterizer_n::CullTriangle<false>(v(-5, 10, 0.5f), v(5, 10, 0.5f), v(-3, 100, 0.5f)));
-    // with MaxZ = 1 the far lane is 32767 and saturation keeps every depth at or below it
-    EXPECT_TRUE(Rasterizer_n::CullTriangle<false>(v(10, 10, 1.5f), v(100, 10, 1.5f), v(10, 100, 1.5f)));
-    // a point: rounding decides at the edge (640.6 rounds to 641, beyond the bound 640; truncation gives 640)
+    auto cull = [&](float x0, float x1, float x2, float z0, float z1, float z2) {
+        return Rasterizer_n::CullTriangle<false>(v(x0, 10, z0), v(x1, 10, z1), v(x2, 100, z2));
+    };
+    EXPECT_TRUE(cull(10, 100, 10, 0.5f, 0.5f, 0.5f));   // inside
+    EXPECT_FALSE(cull(10, 100, 10, 0, 0, 0));           // on the near bound: strict
+    EXPECT_FALSE(cull(10, 100, 10, 0.5f, 0, 0));        // one vertex in front is not enough
+    EXPECT_FALSE(cull(700, 800, 700, 0.5f, 0.5f, 0.5f));
+    EXPECT_FALSE(cull(-5, -1, -3, 0.5f, 0.5f, 0.5f));
+    EXPECT_TRUE(cull(-5, 5, -3, 0.5f, 0.5f, 0.5f));     // straddling the left edge
+    EXPECT_TRUE(cull(10, 100, 10, 1.5f, 1.5f, 1.5f));   // saturation keeps depths at the far lane
+    // 640.6 rounds to 641, beyond the bound; truncation gives 640
     EXPECT_FALSE(Rasterizer_n::CullerAccepts(Rasterizer_n::CullerVertexMask<true>(v(640.6f, 10, 0.5f))));
     EXPECT_TRUE(Rasterizer_n::CullerAccepts(Rasterizer_n::CullerVertexMask<false>(v(640.6f, 10, 0.5f))));
-
     Rasterizer_n::Viewport_s half = {0, 0, 640, 480, 0.0f, 0.5f};
     Rasterizer_n::SetViewport(half);
-    EXPECT_FALSE(Rasterizer_n::CullTriangle<false>(v(10, 10, 0.6f), v(100, 10, 0.6f), v(10, 100, 0.6f)));
-    EXPECT_TRUE(Rasterizer_n::CullTriangle<false>(v(10, 10, 0.6f), v(100, 10, 0.4f), v(10, 100, 0.6f)));
+    EXPECT_FALSE(cull(10, 100, 10, 0.6f, 0.6f, 0.6f));
+    EXPECT_TRUE(cull(10, 100, 10, 0.6f, 0.4f, 0.6f));
 }
 
 }  // namespace

@@ -222,7 +222,6 @@ JNIEXPORT jlong JNICALL Java_TestNatives_lookup(JNIEnv* env, jclass, jint cls, j
         });                                                                                      \
     }
 COPIED(copiedInts, int, jintArray)
-COPIED(copiedShorts, short, jshortArray)
 COPIED(copiedBytes, signed char, jbyteArray)
 COPIED(copiedFloats, float, jfloatArray)
 #undef COPIED
@@ -250,8 +249,6 @@ JNIEXPORT jint JNICALL Java_TestNatives_copiedBooleans(JNIEnv* env, jclass, jboo
         });                                                                                      \
     }
 PINNED(pinnedInts, int, jintArray)
-PINNED(pinnedFloats, float, jfloatArray)
-PINNED(pinnedShorts, short, jshortArray)
 #undef PINNED
 
 JNIEXPORT jint JNICALL Java_TestNatives_pinnedBooleans(JNIEnv* env, jclass, jbooleanArray a, jboolean readOnly) {
